@@ -1,0 +1,38 @@
+# Build, test and run the Tcl binding of the task interfaces.
+#   make build   configure and build into build/ (libraries and pkgIndex.tcl in build/lib)
+#   make test    build and run every test, then again under AddressSanitizer and UBSan
+#   make clean   remove the build folders
+
+BUILD      ?= build
+SAN_BUILD  ?= build-san
+JOBS       ?= 2
+PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev libgtest-dev
+CMAKE_ARGS ?=
+
+.PHONY: deps build test test-plain test-sanitize clean
+
+deps:
+	@missing=""; for p in $(PACKAGES); do \
+	  dpkg-query -W -f='$${Status}' $$p 2>/dev/null | grep -q 'install ok installed' || missing="$$missing $$p"; \
+	done; \
+	if [ -n "$$missing" ]; then \
+	  echo "installing:$$missing"; \
+	  apt-get update && DEBIAN_FRONTEND=noninteractive apt-get install -y $$missing; \
+	fi
+
+build: deps
+	cmake -S . -B $(BUILD) $(CMAKE_ARGS)
+	cmake --build $(BUILD) -j $(JOBS)
+
+test-plain: build
+	ctest --test-dir $(BUILD) --output-on-failure -j $(JOBS)
+
+test-sanitize: deps
+	cmake -S . -B $(SAN_BUILD) -DKELMAR_SANITIZE=ON -DCMAKE_BUILD_TYPE=Debug $(CMAKE_ARGS)
+	cmake --build $(SAN_BUILD) -j $(JOBS)
+	ctest --test-dir $(SAN_BUILD) --output-on-failure -j $(JOBS)
+
+test: test-plain test-sanitize
+
+clean:
+	rm -rf $(BUILD) $(SAN_BUILD)

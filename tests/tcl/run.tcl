@@ -1,0 +1,15 @@
+# Runs one test file and exits non-zero when any of its tests failed.
+#   tclsh run.tcl FILE.test
+package require tcltest 2.5
+lappend auto_path $::env(KELMAR_LIB)
+set ::kelmarFailed 0
+proc tcltest::cleanupTestsHook {} {
+    if {$::tcltest::numTests(Failed) > 0} { set ::kelmarFailed 1 }
+    if {$::tcltest::numTests(Total) == 0} { set ::kelmarFailed 1 }
+}
+tcltest::configure -verbose e
+set file [lindex $argv 0]
+set argv {}
+source [file join [file dirname [info script]] common.tcl]
+source $file
+exit $::kelmarFailed
