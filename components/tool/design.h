@@ -1,0 +1,277 @@
+// The reference tool's in-memory design model and the per-interpreter tool state.
+//
+// A design is a device (a grid of sites X<col>Y<row>, grouped into banks), cells placed on sites,
+// nets from one driver to many loads, ports on sites and clocks. Every cell, net, port, clock, bank
+// and site has a name unique across all of them, so that a script can name any object by a plain
+// word. The floorplan constraints (blocks and prohibited sites) belong to the design, since they are
+// saved with it; the timing analyses live in the tool state only.
+#pragma once
+
+#include <tcl.h>
+
+#include <cstdint>
+#include <map>
+#include <memory>
+#include <optional>
+#include <set>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "CommonI/RefCountPtr.h"
+#include "TcltaskI/ITclProject.h"
+
+namespace TcltaskI {
+class ITimingAnalysis;
+class IXFloorplan;
+}  // namespace TcltaskI
+
+namespace kelmartool {
+
+// ---------------------------------------------------------------------------------------------
+// Design objects
+
+enum class Kind { Cell, Net, Port, Clock, Bank, Site };
+
+// The word a script sees for a kind ("cell", "net", ...), and back. FromWord gives nothing for a
+// word that is no kind.
+const char* KindWord(Kind kind) noexcept;
+std::optional<Kind> KindFromWord(std::string_view word) noexcept;
+
+// Free-form properties of an object, in name order.
+using Properties = std::map<std::string, std::string>;
+
+struct Bank {
+    std::string name;
+    // The sites of the bank: columns x0..x1 and rows y0..y1, both inclusive.
+    int x0 = 0, y0 = 0, x1 = 0, y1 = 0;
+    // How many output ports the bank may drive at once before simultaneous switching is a risk.
+    int ssoLimit = 0;
+
+    bool Contains(int x, int y) const noexcept { return x >= x0 && x <= x1 && y >= y0 && y <= y1; }
+};
+
+struct SiteRef {
+    int x = 0;
+    int y = 0;
+    friend bool operator==(const SiteRef&, const SiteRef&) = default;
+    friend auto operator<=>(const SiteRef&, const SiteRef&) = default;
+};
+
+struct Device {
+    std::string name;
+    int columns = 0;
+    int rows = 0;
+    // Cells one site can hold.
+    int siteCapacity = 1;
+    std::vector<Bank> banks;
+
+    // "X<col>Y<row>".
+    static std::string SiteName(int x, int y);
+    static std::string SiteName(const SiteRef& site) { return SiteName(site.x, site.y); }
+    // The site a name stands for when it lies on this device.
+    std::optional<SiteRef> ParseSite(std::string_view name) const;
+    bool OnDevice(int x, int y) const noexcept { return x >= 0 && y >= 0 && x < columns && y < rows; }
+    // The bank that holds the site, or null.
+    const Bank* BankOf(int x, int y) const noexcept;
+};
+
+struct Cell {
+    std::string name;
+    std::string type;        // LUT, FF, IOB, RAM, ...
+    std::string site;        // empty while unplaced
+    double delay = 0.0;      // ns: propagation, or clock to output for a sequential cell
+    double setup = 0.0;      // ns: setup time of a sequential cell
+    bool sequential = false; // starts and ends timing paths
+    std::string clock;       // the clock of a sequential cell
+    Properties properties;
+};
+
+struct Net {
+    std::string name;
+    std::string driver;              // a cell or an input port
+    std::vector<std::string> loads;  // cells or output ports
+    double delay = 0.0;              // ns, from the driver to every load
+    Properties properties;
+};
+
+struct IoPort {
+    std::string name;
+    bool output = false;  // "in" or "out" in the file
+    std::string site;
+    std::string standard;  // I/O standard, free text
+    Properties properties;
+};
+
+struct Clock {
+    std::string name;
+    double period = 0.0;  // ns
+    std::string net;      // the net it drives
+    Properties properties;
+};
+
+// A floorplan block: cells grouped into a region of the device.
+struct Block {
+    std::string name;
+    std::vector<std::string> cells;
+    // The region, columns x0..x1 and rows y0..y1 inclusive; absent until constrained.
+    std::optional<int> x0, y0, x1, y1;
+    Properties constraints;
+};
+
+// What a name stands for inside one design.
+struct ObjectRef {
+    Kind kind = Kind::Cell;
+    std::size_t index = 0;  // into the vector of that kind; for a site x + y * columns
+};
+
+class Design {
+public:
+    std::string name;
+    Device device;
+    std::vector<Cell> cells;
+    std::vector<Net> nets;
+    std::vector<IoPort> ports;
+    std::vector<Clock> clocks;
+    std::vector<Block> blocks;
+    std::set<std::string> prohibited;  // site names
+    Properties properties;
+
+    // Rebuilds the name index and checks the design: unique names, every reference resolvable,
+    // sites on the device. Empty on success, else the first problem in words.
+    std::string Index();
+
+    std::optional<ObjectRef> Find(std::string_view name) const;
+    const Cell* FindCell(std::string_view name) const;
+    const Net* FindNet(std::string_view name) const;
+    const IoPort* FindPort(std::string_view name) const;
+    const Clock* FindClock(std::string_view name) const;
+    const Bank* FindBank(std::string_view name) const;
+    Cell* FindCell(std::string_view name);
+    Net* FindNet(std::string_view name);
+    IoPort* FindPort(std::string_view name);
+    Clock* FindClock(std::string_view name);
+    Block* FindBlock(std::string_view name);
+
+    // Every object name of one kind, in design order (sites row by row).
+    std::vector<std::string> Names(Kind kind) const;
+    // The type word of a named object ("cell", ...), or empty.
+    std::string TypeOf(std::string_view name) const;
+    // The properties of a named object in name order, built-in ones included, or nothing.
+    std::optional<Properties> PropertiesOf(std::string_view name) const;
+
+private:
+    std::map<std::string, ObjectRef, std::less<>> m_index;
+};
+
+// JSON (design_io.cpp). Read gives the design or leaves `error` saying why, with the file name.
+std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error);
+std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error);
+bool WriteDesign(const Design& design, const std::string& file, std::string& error);
+std::string FormatDesign(const Design& design);
+
+// ---------------------------------------------------------------------------------------------
+// Typed settings, as kept by the global settings, the highlight and the selection.
+
+enum class SettingType { Bool, Int, Double, String, Color, Choice };
+const char* SettingTypeWord(SettingType type) noexcept;
+
+struct Setting {
+    SettingType type = SettingType::String;
+    std::string value;         // canonical text of the value
+    std::string defaultValue;  // what unset restores; a user setting has none and goes
+    std::string description;
+    std::vector<std::string> choices;  // for Choice
+    bool builtIn = false;
+};
+
+class SettingTable {
+public:
+    void Define(const std::string& name, SettingType type, const std::string& value, const std::string& description,
+                std::vector<std::string> choices = {});
+    // Checks `text` against the setting's type and stores its canonical form. A name that is not
+    // defined becomes a user string setting when `allowNew` is true. Empty on success.
+    std::string Set(const std::string& name, const std::string& text, bool allowNew);
+    // A built-in setting goes back to its default, a user setting goes. Empty on success.
+    std::string Unset(const std::string& name);
+    const Setting* Find(const std::string& name) const;
+    const std::map<std::string, Setting>& All() const noexcept { return m_settings; }
+
+private:
+    std::map<std::string, Setting> m_settings;
+};
+
+// Validates a colour: a named colour or #rrggbb. Gives the canonical lower-case form or nothing.
+std::optional<std::string> CanonicalColor(std::string_view text);
+
+// ---------------------------------------------------------------------------------------------
+// The tool state of one interpreter
+
+class ProjectComponent;  // project.cpp
+struct TimingData;       // timing.cpp
+struct FloorplanData;    // floorplan.cpp
+
+struct Viewport {
+    double x = 0, y = 0, width = 0, height = 0;
+    friend bool operator==(const Viewport&, const Viewport&) = default;
+};
+
+struct ViewState {
+    std::vector<Viewport> history;  // every viewport shown, oldest first
+    std::size_t position = 0;       // the one shown now
+};
+
+struct ToolState {
+    explicit ToolState(Tcl_Interp* interp);
+    ~ToolState();
+    ToolState(const ToolState&) = delete;
+    ToolState& operator=(const ToolState&) = delete;
+
+    Tcl_Interp* interp;
+
+    // Open projects in opening order; the last is the current one.
+    std::vector<CommonI::RefCountPtr<TcltaskI::ITclProject>> projects;
+    ProjectComponent* Current() const noexcept;
+    // The design of the current project, or null when none is open.
+    Design* CurrentDesign() const noexcept;
+    // Counts every change of the current design (open, close, reload, edits that move objects),
+    // so that derived data (timing results, floorplan views) can tell it is stale.
+    uint64_t designEpoch = 0;
+    // Called after the current design changed: prunes names that no longer exist, resets the view.
+    void DesignChanged();
+
+    SettingTable settings;   // global settings
+    ViewState view;
+    std::map<std::string, std::string> highlight;  // object -> colour
+    SettingTable highlightSettings;
+    std::vector<std::string> selection;             // in the order of selecting
+    SettingTable selectionSettings;
+    std::map<std::string, std::vector<std::string>> collections;
+
+    // Filled by the timing analysis and the floorplan in their own files.
+    std::shared_ptr<TimingData> timing;
+    std::shared_ptr<FloorplanData> floorplan;
+
+    // Releases every counted pointer held, so that no component keeps the state alive through a
+    // cycle; called when the interpreter goes.
+    void Shutdown();
+};
+
+using StatePtr = std::shared_ptr<ToolState>;
+
+// The tool state of an interpreter (made by Kelmartool_Init), or null.
+StatePtr StateOf(Tcl_Interp* interp);
+
+// Resolves a collection value: the name of a collection, or a list of object names of the current
+// design. False with `error` set when a name is unknown or no project is open.
+bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& names, std::string& error);
+
+// The text every design operation fails with when no project is open.
+inline constexpr const char* kNoProject = "no project is open: open one with projmgr Open FILE msgVar";
+
+// The analyses and the floorplan of the state, made in timing.cpp and floorplan.cpp; each answers
+// through the counted interface with no reference taken yet.
+TcltaskI::ITimingAnalysis* NewTimingAnalysis(const StatePtr& state);
+TcltaskI::IXFloorplan* NewFloorplan(const StatePtr& state);
+
+}  // namespace kelmartool

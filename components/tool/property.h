@@ -1,0 +1,92 @@
+// Tcl values in and out of the tool: every operation answers with a UtilI::MITclProperty whose Tcl
+// value is a proper list or dict, and reads its property arguments back as Tcl values.
+#pragma once
+
+#include <tcl.h>
+
+#include <initializer_list>
+#include <map>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include "Port/StringBase.h"
+#include "UtilI/ITclProperty.h"
+
+namespace kelmartool {
+
+// A counted Tcl value: holds one reference of its own for as long as it lives.
+class TclValue {
+public:
+    TclValue() noexcept = default;
+    explicit TclValue(Tcl_Obj* obj) noexcept : m_obj(obj) {
+        if (m_obj != nullptr) Tcl_IncrRefCount(m_obj);
+    }
+    TclValue(const TclValue& other) noexcept : TclValue(other.m_obj) {}
+    TclValue(TclValue&& other) noexcept : m_obj(std::exchange(other.m_obj, nullptr)) {}
+    TclValue& operator=(TclValue other) noexcept {
+        std::swap(m_obj, other.m_obj);
+        return *this;
+    }
+    ~TclValue() {
+        if (m_obj != nullptr) Tcl_DecrRefCount(m_obj);
+    }
+
+    Tcl_Obj* get() const noexcept { return m_obj; }
+    explicit operator bool() const noexcept { return m_obj != nullptr; }
+    std::string Text() const;
+
+private:
+    Tcl_Obj* m_obj = nullptr;
+};
+
+// Builders of plain values. Every one gives a new object without references.
+Tcl_Obj* NewText(std::string_view text);
+Tcl_Obj* NewInt(long long value);
+Tcl_Obj* NewDouble(double value);  // shortest text that reads back, e.g. 2.5, 10
+Tcl_Obj* NewBool(bool value);      // 1 or 0
+Tcl_Obj* NewList(const std::vector<std::string>& words);
+Tcl_Obj* NewList(std::initializer_list<Tcl_Obj*> items);  // takes the items as they are
+
+// A dict built in insertion order, so that answers read in a fixed, meaningful order.
+class DictBuilder {
+public:
+    DictBuilder();
+    DictBuilder& Add(std::string_view key, Tcl_Obj* value);
+    DictBuilder& Add(std::string_view key, std::string_view text) { return Add(key, NewText(text)); }
+    DictBuilder& Add(std::string_view key, const char* text) { return Add(key, NewText(text)); }
+    DictBuilder& Add(std::string_view key, const std::string& text) { return Add(key, NewText(text)); }
+    DictBuilder& Add(std::string_view key, int value) { return Add(key, NewInt(value)); }
+    DictBuilder& Add(std::string_view key, long long value) { return Add(key, NewInt(value)); }
+    DictBuilder& Add(std::string_view key, std::size_t value) { return Add(key, NewInt(static_cast<long long>(value))); }
+    DictBuilder& Add(std::string_view key, double value) { return Add(key, NewDouble(value)); }
+    DictBuilder& Add(std::string_view key, bool value) { return Add(key, NewBool(value)); }
+    Tcl_Obj* Take() noexcept;  // the dict, without a reference; the builder is empty afterwards
+
+private:
+    TclValue m_dict;
+};
+
+// A new property component holding `value` (which may have no references yet). Null, with
+// `message` set, when the property component cannot be made.
+UtilI::MITclProperty MakeProperty(Tcl_Obj* value, Port_String& message);
+
+// Sets `result` to a property holding `value` and gives 1; on failure 0 with `message` set. The
+// one way every operation of the tool answers.
+CommonI::RESULT Answer(Tcl_Obj* value, UtilI::MITclProperty& result, Port_String& message);
+// Gives 0 with `text` as the failure text.
+CommonI::RESULT Fail(Port_String& message, const std::string& text);
+
+// The Tcl value a property holds (counted), or an empty value for a null property.
+TclValue ValueOf(const UtilI::MITclProperty& property);
+std::string TextOf(const UtilI::MITclProperty& property);
+// The words of a property's value read as a list; false when it is no proper list.
+bool WordsOf(const UtilI::MITclProperty& property, std::vector<std::string>& words);
+// The words of every property of a list, each read as a list, joined in order.
+bool WordsOf(const UtilI::TclPropertyList& list, std::vector<std::string>& words);
+
+// The texts `(nil)` and `nil` stand for "not given" in view options.
+bool IsNil(std::string_view text) noexcept;
+
+}  // namespace kelmartool
