@@ -353,16 +353,6 @@ TEST(XUID, EqualityIgnoresTheFlagByte) {
     EXPECT_FALSE(flagged == Port::XUID(0x46d2ad5270684ab9ull, 0x81b45c9aa2b2cc67ull));
 }
 
-TEST(XUID, BuildFunctionFillsStorage) {
-    static constexpr Port::XUIDLiteral literal{0x9bd2871ff36941f3ull, 0xad7abd114008d664ull};
-    alignas(Port::XUID) unsigned char storage[sizeof(Port::XUID)];
-    const Port::XUIDFunction build = &Port::BuildXUID<literal>;
-    Port::XUID* id = build(reinterpret_cast<Port::XUID*>(storage));
-    EXPECT_EQ(static_cast<void*>(id), static_cast<void*>(storage));
-    ExpectWellFormed(id->ToString(), "9bd2871f-f369-41f3-ad7a-bd114008d664");
-    id->~XUID();
-}
-
 // ---------------------------------------------------------------------------------------------
 // Port::MsgData and UT_STR
 
@@ -645,16 +635,6 @@ TEST(InstanceTable, ObserverHearsEveryDeath) {
     CitP::InstanceTable::Born(id);
     CitP::InstanceTable::Died(id, "unobserved");
     EXPECT_EQ(g_deaths.size(), 2u);
-}
-
-TEST(InstanceTable, FactoryComponentsAreCounted) {
-    CitP::Factory::RegisterClass(kWidgetClassID, &MakeWidgetOne);
-    int context = 0;
-    const ObserverScope scope(&context);
-    CitP::Factory::CreateInstanceRef(kWidgetClassID);  // dropped at once
-    ASSERT_EQ(g_deaths.size(), 1u);
-    EXPECT_EQ(g_deaths[0].first, kWidgetClassID.first);
-    EXPECT_EQ(g_deaths[0].detail, "widget");
 }
 
 // ---------------------------------------------------------------------------------------------
