@@ -1,0 +1,523 @@
+// The scripting support in a real interpreter: object commands and their argument vectors, the
+// lifetime of handed-over handles, plain value handles, fetches and stores, identifier variables,
+// the wrapper resolver and the support's own GetInterface wrappers.
+#include <gtest/gtest.h>
+#include <tcl.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "CommonI/RefCountPtr.h"
+#include "HdcI/IHDProject.h"
+#include "Script/Handle.h"
+#include "Script/KelmarPkg.h"
+#include "Script/TScriptHandleHelper.h"
+#include "Script/TTclWrapFactory.h"
+#include "Script/TclWrapFactory.h"
+#include "Script/TclWrapSupport.h"
+
+namespace {
+
+using Script::Handle;
+using Script::PtrHandleBase;
+
+inline constexpr Port::XUIDLiteral IProbeID{0x5c0ffee1d2e34b7aull, 0x9e1f00d5a1b2c3d4ull};
+// Registered by nobody: the resolver has no factory for it.
+inline constexpr Port::XUIDLiteral IUnwrappedID{0x0badc0de12344a5bull, 0x8c6d7e8f90a1b2c3ull};
+
+class IProbe : public CitI::IInterface {
+public:
+    static constexpr const Port::XUIDLiteral& IID = IProbeID;
+    static constexpr const char* NAME = "IProbe";
+};
+
+int g_liveObjects = 0;
+
+// A counted object with the faces IInterface, IProbe and, when asked to, IHDProject.
+class ProbeObject final : public IProbe, public HdcI::IHDProject {
+public:
+    explicit ProbeObject(bool project = false) : m_counter(static_cast<IProbe*>(this)), m_project(project) {
+        ++g_liveObjects;
+    }
+    ~ProbeObject() override { --g_liveObjects; }
+
+    CitI::IInterface* GetInterface(const Port::XUID& id) override {
+        if (id == CommonI::IRefCountID) return &m_counter;
+        if (id == CitI::IInterfaceID || id == IProbeID) return static_cast<IProbe*>(this);
+        if (m_project && id == HdcI::IHDProjectID) return static_cast<HdcI::IHDProject*>(this);
+        return nullptr;
+    }
+    Port_String GetName() override { return "probe"; }
+    Port_String GetFileName() override { return "probe.hd"; }
+    long Count() const { return m_counter.Count(); }
+
+private:
+    CommonI::RefCounter m_counter;
+    bool m_project;
+};
+
+// A handle that tells the test what reached it: its argument vectors and its end.
+struct Seen {
+    struct Arg {
+        Handle* handle;
+        std::string text;
+        bool plainValue;
+    };
+    std::vector<std::vector<Arg>> calls;
+    std::vector<std::string> events;
+};
+
+class RecordingHandle : public Script::PtrHandle<IProbe> {
+public:
+    RecordingHandle(IProbe* value, Tcl_Interp* interp, Seen& seen, std::string tag)
+        : PtrHandle(value, interp), m_seen(seen), m_tag(std::move(tag)) {}
+    ~RecordingHandle() override { m_seen.events.push_back("destroy " + m_tag); }
+
+    void ReleaseValue() override { m_seen.events.push_back("release " + m_tag); }
+    int Execute(int argc, Handle* const* argv, Tcl_Interp* interp) override {
+        std::vector<Seen::Arg> args;
+        for (int i = 0; i < argc; ++i) {
+            const char* text = argv[i]->GetString();
+            args.push_back({argv[i], text ? text : "<null>", dynamic_cast<Script::TclObjHandleBase*>(argv[i]) != nullptr});
+        }
+        m_seen.calls.push_back(std::move(args));
+        if (onExecute) return onExecute(interp, argc, argv);
+        Tcl_SetObjResult(interp, Tcl_NewIntObj(argc));
+        return TCL_OK;
+    }
+
+    std::function<int(Tcl_Interp*, int, Handle* const*)> onExecute;
+
+private:
+    Seen& m_seen;
+    std::string m_tag;
+};
+
+class OtherRecordingHandle final : public RecordingHandle {
+    using RecordingHandle::RecordingHandle;
+};
+
+// The test's wrapper of IProbe, made through the factory table.
+class ProbeWrapper final : public Script::PtrHandle<IProbe> {
+public:
+    ProbeWrapper(IProbe* object, Tcl_Interp* interp) : PtrHandle(object, interp) {
+        m_helper.SetHandle(this);
+        ProbeWrapper::AddRefValue();
+    }
+    void AddRefValue() override { Counter()->AddRef(); }
+    void ReleaseValue() override { Counter()->Release(); }
+    CitI::IInterface* GetScriptHandle(const Port::XUID& id) {
+        return id == CitI::IScriptHandleID || id == CitI::IInterfaceID ? &m_helper : nullptr;
+    }
+
+private:
+    CommonI::IRefCount* Counter() {
+        void* value = nullptr;
+        GetValue(&value);
+        return static_cast<CommonI::IRefCount*>(static_cast<IProbe*>(value)->GetInterface(CommonI::IRefCountID));
+    }
+    Script::TScriptHandleHelper<ProbeWrapper> m_helper;
+};
+
+Script::TTclWrapFactory<ProbeWrapper, IProbe> g_probeFactory;
+
+std::string Text(const Port::XUID& id) { return id.ToString().c_str(); }
+
+class ScriptTest : public ::testing::Test {
+protected:
+    static void SetUpTestSuite() {
+        Tcl_FindExecutable(nullptr);
+        Script::TclWrapFactory::RegisterFactory(IProbeID, &g_probeFactory);
+    }
+    void SetUp() override {
+        interp = Tcl_CreateInterp();
+        ASSERT_EQ(Kelmarpkg_Init(interp), TCL_OK);
+    }
+    void TearDown() override {
+        Tcl_DeleteInterp(interp);
+        EXPECT_EQ(g_liveObjects, 0);
+    }
+
+    int Eval(const std::string& script) { return Tcl_Eval(interp, script.c_str()); }
+    std::string Result() const { return Tcl_GetStringResult(interp); }
+    std::string Var(const char* name) const {
+        const char* value = Tcl_GetVar(interp, name, TCL_GLOBAL_ONLY);
+        return value ? value : "<unset>";
+    }
+    // Hands `handle` to Tcl and gives its word.
+    std::string HandOver(Handle* handle) {
+        handle->SetResult(interp);
+        return Result();
+    }
+
+    Tcl_Interp* interp = nullptr;
+    Seen seen;
+    IProbe* const someValue = reinterpret_cast<IProbe*>(&seen);  // a value only compared, never called
+};
+
+TEST_F(ScriptTest, HandOverMakesAKelmarCommandFoundByItsWord) {
+    auto* handle = new RecordingHandle(someValue, interp, seen, "a");
+    EXPECT_EQ(handle->GetTclObj(), nullptr);
+    const std::string word = HandOver(handle);
+    EXPECT_EQ(word.rfind("::kelmar::IProbe", 0), 0u) << word;
+    EXPECT_EQ(word, handle->GetString());
+    ASSERT_EQ(Eval("info commands " + word), TCL_OK);
+    EXPECT_EQ(Result(), word);
+
+    handle->SetVariable(interp, "again");
+    EXPECT_EQ(Var("again"), word);
+    Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
+    Tcl_IncrRefCount(obj);
+    EXPECT_EQ(PtrHandleBase::GetHandleFromTclObj(obj), handle);
+    Tcl_SetStringObj(obj, "::kelmar::IProbe0", -1);
+    EXPECT_EQ(PtrHandleBase::GetHandleFromTclObj(obj), nullptr);
+    Tcl_DecrRefCount(obj);
+    EXPECT_TRUE(seen.events.empty());
+}
+
+TEST_F(ScriptTest, ExecuteGetsHandlesAsThemselvesAndOtherWordsAsValues) {
+    auto* callee = new RecordingHandle(someValue, interp, seen, "callee");
+    auto* other = new OtherRecordingHandle(nullptr, interp, seen, "other");
+    const std::string word = HandOver(callee);
+    ASSERT_EQ(Tcl_SetVar(interp, "o", HandOver(other).c_str(), 0) != nullptr, true);
+
+    ASSERT_EQ(Eval(word + " Do $o plain 42 ::kelmar::IProbe0 {::kelmar::}"), TCL_OK) << Result();
+    EXPECT_EQ(Result(), "7");  // Execute's own result and argc
+    ASSERT_EQ(seen.calls.size(), 1u);
+    const auto& args = seen.calls[0];
+    const std::vector<std::string> texts = {word, "Do", other->GetString(), "plain", "42", "::kelmar::IProbe0", "::kelmar::"};
+    ASSERT_EQ(args.size(), texts.size());
+    for (size_t i = 0; i < args.size(); ++i) {
+        EXPECT_EQ(args[i].text, texts[i]) << i;
+        EXPECT_EQ(args[i].plainValue, i != 2) << i;
+    }
+    EXPECT_EQ(args[2].handle, other);
+
+    // A long call leaves the local buffer and keeps the same rules.
+    std::string script = word;
+    for (int i = 0; i < 20; ++i) script += " w" + std::to_string(i);
+    ASSERT_EQ(Eval(script + " $o " + word), TCL_OK);
+    EXPECT_EQ(Result(), "23");
+    const auto& longArgs = seen.calls[1];
+    EXPECT_EQ(longArgs[20].text, "w19");
+    EXPECT_TRUE(longArgs[20].plainValue);
+    EXPECT_EQ(longArgs[21].handle, other);
+    EXPECT_EQ(longArgs[22].handle, callee);
+
+    callee->onExecute = [](Tcl_Interp* in, int, Handle* const*) {
+        Tcl_SetResult(in, const_cast<char*>("refused"), TCL_STATIC);
+        return TCL_ERROR;
+    };
+    EXPECT_EQ(Eval(word + " Do"), TCL_ERROR);
+    EXPECT_EQ(Result(), "refused");
+}
+
+TEST_F(ScriptTest, PlainPtrHandleIsNoCommandAndNullValueIsAllowed) {
+    auto* plain = new Script::PtrHandle<IProbe>(nullptr, interp);
+    void* value = someValue;
+    EXPECT_EQ(plain->GetValue(&value), 1);
+    const std::string word = HandOver(plain);
+    EXPECT_EQ(word.rfind("::kelmar::IProbe", 0), 0u);
+    EXPECT_EQ(Eval(word + " Anything"), TCL_ERROR);
+    EXPECT_NE(Result().find("is no command"), std::string::npos) << Result();
+    EXPECT_NE(Result().find(word), std::string::npos) << Result();
+}
+
+TEST_F(ScriptTest, SameValueAndClassGivesOneWordAndTheNewerHandleEndsAfterTheCommand) {
+    auto* first = new RecordingHandle(someValue, interp, seen, "first");
+    auto* second = new RecordingHandle(someValue, interp, seen, "second");
+    auto* otherClass = new OtherRecordingHandle(someValue, interp, seen, "otherClass");
+    const std::string word = HandOver(first);
+    EXPECT_EQ(HandOver(first), word);
+    EXPECT_EQ(HandOver(second), word);
+    EXPECT_EQ(second->GetString(), word);  // still usable by its maker
+    EXPECT_NE(HandOver(otherClass), word);
+    EXPECT_TRUE(seen.events.empty());
+
+    ASSERT_EQ(Eval(word + " Do"), TCL_OK);
+    EXPECT_EQ(seen.events, (std::vector<std::string>{"release second", "destroy second"}));
+    EXPECT_EQ(seen.calls.size(), 1u);
+
+    // Inside a command, with another command nested in it, the duplicate lives until the outer one
+    // has returned.
+    seen.events.clear();
+    const std::string otherWord = otherClass->GetString();
+    first->onExecute = [&](Tcl_Interp* in, int, Handle* const*) {
+        auto* third = new RecordingHandle(someValue, in, seen, "third");
+        third->SetResult(in);
+        EXPECT_EQ(Tcl_Eval(in, (otherWord + " Nested").c_str()), TCL_OK);
+        EXPECT_TRUE(seen.events.empty());
+        EXPECT_EQ(third->GetString(), word);
+        Tcl_SetObjResult(in, third->GetTclObj());
+        return TCL_OK;
+    };
+    ASSERT_EQ(Eval(word + " Do"), TCL_OK);
+    EXPECT_EQ(Result(), word);
+    EXPECT_EQ(seen.events, (std::vector<std::string>{"release third", "destroy third"}));
+}
+
+TEST_F(ScriptTest, AnotherInterpreterGetsItsOwnCommand) {
+    Tcl_Interp* second = Tcl_CreateInterp();
+    ASSERT_EQ(Kelmarpkg_Init(second), TCL_OK);
+    const std::string word = HandOver(new RecordingHandle(someValue, interp, seen, "here"));
+    auto* there = new RecordingHandle(someValue, second, seen, "there");
+    there->SetResult(second);
+    const std::string thereWord = Tcl_GetStringResult(second);
+    EXPECT_NE(thereWord, word);
+    EXPECT_EQ(Tcl_Eval(second, (thereWord + " Do").c_str()), TCL_OK);
+    Tcl_DeleteInterp(second);
+    EXPECT_EQ(seen.events, (std::vector<std::string>{"release there", "destroy there"}));
+}
+
+TEST_F(ScriptTest, RenameToNothingEndsTheHandleOnceAndTheRegistryForgetsIt) {
+    auto* handle = new RecordingHandle(someValue, interp, seen, "a");
+    const std::string word = HandOver(handle);
+    ASSERT_EQ(Eval("rename " + word + " {}"), TCL_OK);
+    EXPECT_EQ(seen.events, (std::vector<std::string>{"release a", "destroy a"}));
+    Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
+    Tcl_IncrRefCount(obj);
+    EXPECT_EQ(PtrHandleBase::GetHandleFromTclObj(obj), nullptr);
+    Tcl_DecrRefCount(obj);
+
+    // The value has no word any more: a new handle of it gets a new one.
+    EXPECT_NE(HandOver(new RecordingHandle(someValue, interp, seen, "b")), word);
+}
+
+TEST_F(ScriptTest, HandleRenamedAwayDuringACommandStaysUntilTheCommandReturns) {
+    auto* caller = new RecordingHandle(someValue, interp, seen, "caller");
+    auto* argument = new OtherRecordingHandle(nullptr, interp, seen, "argument");
+    const std::string word = HandOver(caller);
+    const std::string argWord = HandOver(argument);
+    caller->onExecute = [&](Tcl_Interp* in, int, Handle* const* argv) {
+        EXPECT_EQ(Tcl_Eval(in, ("rename " + argWord + " {}").c_str()), TCL_OK);
+        EXPECT_TRUE(seen.events.empty());
+        EXPECT_EQ(argv[2]->GetString(), argWord);  // still alive
+        return TCL_OK;
+    };
+    ASSERT_EQ(Eval(word + " Do " + argWord), TCL_OK);
+    EXPECT_EQ(seen.events, (std::vector<std::string>{"release argument", "destroy argument"}));
+}
+
+TEST_F(ScriptTest, DeletedHandleTakesItsCommandAndCopyIsUnregistered) {
+    auto* handle = new RecordingHandle(someValue, interp, seen, "a");
+    const std::string word = HandOver(handle);
+    RecordingHandle copy(*handle);
+    EXPECT_EQ(copy.GetTclObj(), nullptr);
+    void* value = nullptr;
+    EXPECT_EQ(copy.GetValue(&value), 0);
+    EXPECT_EQ(value, someValue);
+    EXPECT_EQ(copy.GetTclInterp(), interp);
+    EXPECT_STREQ(copy.GetTypeName(), "IProbe");
+
+    delete handle;
+    ASSERT_EQ(Eval("info commands " + word), TCL_OK);
+    EXPECT_EQ(Result(), "");
+    EXPECT_EQ(seen.events, (std::vector<std::string>{"destroy a"}));
+}
+
+TEST_F(ScriptTest, PlainValueHandles) {
+    Script::TclIntHandle number(42, nullptr);
+    Script::TclStringHandle text("some text", interp);
+    EXPECT_STREQ(number.GetString(), "42");
+    EXPECT_STREQ(text.GetString(), "some text");
+
+    number.SetResult(interp);
+    EXPECT_EQ(Result(), "42");
+    text.SetVariable(interp, "v");
+    EXPECT_EQ(Var("v"), "some text");
+    ASSERT_EQ(Eval("array set arr {}"), TCL_OK);
+    text.SetVariable(interp, "arr");
+    EXPECT_NE(Result().find("variable is array"), std::string::npos) << Result();
+
+    Script::TclObjHandleBase copy(text);
+    EXPECT_EQ(copy.GetTclObj(), text.GetTclObj());
+    copy = number;
+    EXPECT_STREQ(copy.GetString(), "42");
+
+    Handle* fresh = text.NewHandle(interp);
+    EXPECT_STREQ(fresh->GetString(), "");
+    delete fresh;
+    EXPECT_EQ(text.GetSharedHandle(), number.GetSharedHandle());
+    EXPECT_STREQ(text.GetSharedHandle()->GetString(), "");
+}
+
+// The fetches read the word (IN) or the variable it names (INOUT), and leave Tcl's own message.
+TEST_F(ScriptTest, FetchesByDirection) {
+    using Script::TclWrapSupport;
+    ASSERT_EQ(Eval("set s {a text}; set b off; set i -17"), TCL_OK);
+    struct Case {
+        const char* word;
+        int direction;
+        const char* kind;  // "string", "bool" or "int"
+        int status;
+        const char* expected;  // the value, or a piece of the message
+    };
+    const Case cases[] = {
+        {"hello world", Script::IN, "string", 0, "hello world"},
+        {"s", Script::INOUT, "string", 0, "a text"},
+        {"nosuch", Script::INOUT, "string", 1, "can't read \"nosuch\": no such variable"},
+        {"s", Script::OUT, "string", 1, "OUT"},
+        {"s", Script::RESULT, "string", 1, "RESULT"},
+        {"yes", Script::IN, "bool", 0, "1"},
+        {"b", Script::INOUT, "bool", 0, "0"},
+        {"maybe", Script::IN, "bool", 1, "expected boolean value but got \"maybe\""},
+        {"s", Script::INOUT, "bool", 1, "expected boolean value but got \"a text\""},
+        {"b", Script::OUT, "bool", 1, "OUT"},
+        {"2147483647", Script::IN, "int", 0, "2147483647"},
+        {"i", Script::INOUT, "int", 0, "-17"},
+        {"4x", Script::IN, "int", 1, "expected integer but got \"4x\""},
+        {"nosuch", Script::INOUT, "int", 1, "no such variable"},
+        {"i", Script::RESULT, "int", 1, "RESULT"},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(std::string(c.kind) + " " + c.word + " " + std::to_string(c.direction));
+        Tcl_ResetResult(interp);
+        Script::TclStringHandle handle(c.word, interp);
+        std::string got;
+        int status = 1;
+        if (std::string(c.kind) == "string") {
+            Port_String value;
+            status = TclWrapSupport::FetchString(value, interp, &handle, c.direction);
+            got = value.c_str();
+        } else if (std::string(c.kind) == "bool") {
+            bool value = false;
+            status = TclWrapSupport::FetchBool(value, interp, &handle, c.direction);
+            got = value ? "1" : "0";
+        } else {
+            int32_t value = 0;
+            status = TclWrapSupport::FetchInt32(value, interp, &handle, c.direction);
+            got = std::to_string(value);
+        }
+        EXPECT_EQ(status, c.status);
+        if (c.status == 0) {
+            EXPECT_EQ(got, c.expected);
+        } else {
+            EXPECT_NE(Result().find(c.expected), std::string::npos) << Result();
+        }
+    }
+    Port_String value;
+    EXPECT_EQ(TclWrapSupport::FetchString(value, interp, nullptr, Script::IN), 1);
+
+    Port::XUID id;
+    Script::TclStringHandle idWord(Text(IProbeID).c_str(), interp);
+    EXPECT_EQ(TclWrapSupport::FetchGuid(id, interp, &idWord, Script::IN), 0);
+    EXPECT_TRUE(id == IProbeID);
+    Script::TclStringHandle noId("no identifier", interp);
+    EXPECT_EQ(TclWrapSupport::FetchGuid(id, interp, &noId, Script::IN), 0);
+    EXPECT_TRUE(id.IsNull());
+}
+
+TEST_F(ScriptTest, StoresByDirection) {
+    using Script::TclWrapSupport;
+    Script::TclStringHandle target("out", interp);
+    EXPECT_EQ(TclWrapSupport::StoreString("stored", interp, &target, Script::OUT), 0);
+    EXPECT_EQ(Var("out"), "stored");
+
+    // The length is the string's own: an embedded nul reaches Tcl.
+    EXPECT_EQ(TclWrapSupport::StoreString(Port_String("a\0b", 3), interp, nullptr, Script::RESULT), 0);
+    int length = 0;
+    Tcl_GetStringFromObj(Tcl_GetObjResult(interp), &length);
+    EXPECT_EQ(length, 3);
+
+    EXPECT_EQ(TclWrapSupport::StoreString("x", interp, nullptr, Script::OUT), 1);
+    EXPECT_NE(Result().find("the variable is NULL"), std::string::npos) << Result();
+    ASSERT_EQ(Eval("array set arr {}"), TCL_OK);
+    Script::TclStringHandle array("arr", interp);
+    EXPECT_EQ(TclWrapSupport::StoreString("x", interp, &array, Script::OUT), 1);
+    EXPECT_NE(Result().find("can't set \"arr\": variable is array"), std::string::npos) << Result();
+    EXPECT_EQ(TclWrapSupport::StoreString("x", interp, &target, Script::IN), 1);
+    EXPECT_EQ(Var("out"), "stored");
+
+    EXPECT_EQ(TclWrapSupport::StoreInt64(int64_t{1} << 40, interp, nullptr, Script::RESULT), 0);
+    Tcl_WideInt wide = 0;
+    ASSERT_EQ(Tcl_GetWideIntFromObj(nullptr, Tcl_GetObjResult(interp), &wide), TCL_OK);
+    EXPECT_EQ(wide, Tcl_WideInt{1} << 40);
+}
+
+TEST_F(ScriptTest, CreateVariablesUpToTheTerminator) {
+    Script::TclWrapIDEntry table[] = {
+        {"::kelmar::Probe", "IProbeID", &Port::BuildXUID<IProbeID>},
+        {"deep::er", "IInterfaceID", &Port::BuildXUID<CitI::IInterfaceID>},
+        {"", "", nullptr},
+        {"::kelmar::Probe", "Behind", &Port::BuildXUID<IProbeID>},
+    };
+    EXPECT_EQ(Script::TclWrapSupport::CreateVariables(interp, table), 0) << Result();
+    EXPECT_EQ(Var("::kelmar::Probe::IProbeID"), Text(IProbeID));
+    EXPECT_EQ(Var("::deep::er::IInterfaceID"), Text(CitI::IInterfaceID));
+    EXPECT_TRUE(Port::XUID(Var("::kelmar::Probe::IProbeID").c_str()) == IProbeID);
+    EXPECT_EQ(Var("::kelmar::Probe::Behind"), "<unset>");
+
+    Script::TclWrapIDEntry bad[] = {
+        {"::kelmar::Probe", "arr", &Port::BuildXUID<IProbeID>},
+        {"::kelmar::Probe", "fine", &Port::BuildXUID<IProbeID>},
+        {"", "", nullptr},
+    };
+    ASSERT_EQ(Eval("array set ::kelmar::Probe::arr {}"), TCL_OK);
+    EXPECT_EQ(Script::TclWrapSupport::CreateVariables(interp, bad), 1);
+    EXPECT_NE(Result().find("variable is array"), std::string::npos) << Result();
+    EXPECT_EQ(Var("::kelmar::Probe::fine"), Text(IProbeID));
+}
+
+TEST_F(ScriptTest, ResolverWithNullWithoutAndWithAFactory) {
+    using Script::TclWrapSupport;
+    EXPECT_EQ(TclWrapSupport::TclWrapResolver(IProbeID, nullptr, interp), TCL_OK);
+    EXPECT_EQ(Result(), "0");
+
+    CommonI::RefCountPtr<IProbe> object(new ProbeObject);
+    EXPECT_EQ(TclWrapSupport::TclWrapResolver(IUnwrappedID, object.get(), interp), TCL_ERROR);
+    EXPECT_EQ(Result(), "no wrapper for interface " + Text(IUnwrappedID));
+
+    ASSERT_EQ(TclWrapSupport::TclWrapResolver(IProbeID, object.get(), interp), TCL_OK);
+    const std::string word = Result();
+    EXPECT_EQ(word.rfind("::kelmar::IProbe", 0), 0u);
+    auto* probe = static_cast<ProbeObject*>(object.get());
+    EXPECT_EQ(probe->Count(), 2);
+
+    // A second wrapper of the same object shares the word and lets its reference go after the next
+    // command.
+    ASSERT_EQ(TclWrapSupport::TclWrapResolver(IProbeID, object.get(), interp), TCL_OK);
+    EXPECT_EQ(Result(), word);
+    EXPECT_EQ(probe->Count(), 3);
+    EXPECT_EQ(Eval(word + " Do"), TCL_ERROR);  // a wrapper without commands of its own
+    EXPECT_EQ(probe->Count(), 2);
+
+    ASSERT_EQ(Eval("rename " + word + " {}"), TCL_OK);
+    EXPECT_EQ(probe->Count(), 1);
+}
+
+TEST_F(ScriptTest, SupportWrappersAnswerGetInterfaceOnly) {
+    auto* object = new ProbeObject(true);
+    CitI::IInterface* helper = Script::TclWrapFactory::CreateInstance(CitI::IInterfaceID, static_cast<IProbe*>(object), interp);
+    ASSERT_NE(helper, nullptr);
+    EXPECT_EQ(object->Count(), 1);  // the wrapper's reference is the only one
+    static_cast<CitI::IScriptHandle*>(helper->GetInterface(CitI::IScriptHandleID))->SetResult(interp);
+    const std::string word = Result();
+    EXPECT_EQ(word.rfind("::kelmar::IInterface", 0), 0u) << word;
+
+    ASSERT_EQ(Eval(word + " GetInterface " + Text(IProbeID)), TCL_OK) << Result();
+    const std::string probeWord = Result();
+    EXPECT_EQ(probeWord.rfind("::kelmar::IProbe", 0), 0u) << probeWord;
+    ASSERT_EQ(Eval(word + " GetInterface " + Text(CitI::IInterfaceID) + " ignored"), TCL_OK);
+    EXPECT_EQ(Result(), word);
+    ASSERT_EQ(Eval(word + " GetInterface " + Text(HdcI::IHDProjectID)), TCL_OK) << Result();
+    const std::string projectWord = Result();
+    EXPECT_EQ(projectWord.rfind("::kelmar::IHDProject", 0), 0u) << projectWord;
+    ASSERT_EQ(Eval(projectWord + " GetInterface " + Text(IProbeID)), TCL_OK);
+    EXPECT_EQ(Result(), probeWord);
+    ASSERT_EQ(Eval(word + " GetInterface " + Text(IUnwrappedID)), TCL_OK);
+    EXPECT_EQ(Result(), "0");
+    EXPECT_EQ(Eval(word + " GetInterface " + Text(CommonI::IRefCountID)), TCL_ERROR);
+    EXPECT_EQ(Result(), "no wrapper for interface " + Text(CommonI::IRefCountID));
+    EXPECT_EQ(object->Count(), 3);  // one per word: IInterface, IProbe, IHDProject
+
+    for (const std::string& call : {word + " getinterface x", word + " Get", word, word + " GetInterface"}) {
+        EXPECT_EQ(Eval(call), TCL_ERROR) << call;
+        EXPECT_NE(Result().find("GetInterface"), std::string::npos) << Result();
+    }
+    ASSERT_EQ(Eval("rename " + probeWord + " {}; rename " + projectWord + " {}"), TCL_OK);
+    EXPECT_EQ(object->Count(), 1);
+    // TearDown's interpreter deletion ends the last wrapper, and with it the object.
+}
+
+}  // namespace
