@@ -40,6 +40,7 @@ Tcl_Obj* FetchSource(const char* operation, Tcl_Interp* interp, Handle* handle, 
         return nullptr;
     }
     if (direction == IN) return word;
+    if (interp == nullptr) return nullptr;  // no variables to read
     return Tcl_ObjGetVar2(interp, word, nullptr, TCL_LEAVE_ERR_MSG);
 }
 
@@ -48,7 +49,9 @@ Tcl_Obj* FetchSource(const char* operation, Tcl_Interp* interp, Handle* handle, 
 int StoreValue(const char* operation, Tcl_Interp* interp, Handle* handle, int direction, Tcl_Obj* value) {
     Tcl_IncrRefCount(value);
     int status = 1;
-    if (direction == RESULT) {
+    if (interp == nullptr) {
+        // Nowhere to store, and nowhere to say so: only the status tells.
+    } else if (direction == RESULT) {
         Tcl_SetObjResult(interp, value);
         status = 0;
     } else if (direction != OUT) {
@@ -106,6 +109,7 @@ int TclWrapSupport::StoreInt64(int64_t value, Tcl_Interp* interp, Handle* handle
 
 int TclWrapSupport::CreateVariables(Tcl_Interp* interp, TclWrapIDEntry* table) {
     if (table == nullptr) return 0;
+    if (interp == nullptr) return 1;
     int status = 0;
     for (const TclWrapIDEntry* row = table; !row->variableName.IsEmpty(); ++row) {
         if (row->identifierFunction == nullptr) {
@@ -137,6 +141,7 @@ int TclWrapSupport::CreateVariables(Tcl_Interp* interp, TclWrapIDEntry* table) {
 }
 
 int TclWrapSupport::TclWrapResolver(Port::XUID id, CitI::IInterface* object, Tcl_Interp* interp) {
+    if (interp == nullptr) return TCL_ERROR;
     if (object == nullptr) {
         Tcl_SetObjResult(interp, Tcl_NewIntObj(0));
         return TCL_OK;
