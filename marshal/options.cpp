@@ -1,0 +1,163 @@
+#include "marshal/options.h"
+
+#include <cstring>
+
+#include "CitP/Factory.h"
+#include "Port/MsgData.h"
+#include "package/report.h"
+
+namespace TcltaskI {
+
+namespace {
+
+Port_String Translate(const char* format, const char* a, const char* b = nullptr) {
+    const Port::MsgData data("TclTasksI", "ERROR");
+    return data.TranslateMsg(format, a, b);
+}
+
+// The names of a list from First until IsDone, each written as prefix, dash, name, suffix.
+void AppendNames(Port_String& text, IOptionNameList* list, const char* prefix, const char* suffix) {
+    CommonI::RefCountPtr<IOptionNameIterator> names;
+    if (list->GetIterator(names) != 1 || !names) return;
+    for (names->First(); !names->IsDone(); names->Next()) {
+        text += prefix;
+        text += names->Current();
+        text += suffix;
+    }
+}
+
+// The operation's name: the second word of the signature literal ("new_" for new of a highlight).
+Port_String OperationName(const char* signature) {
+    const char* start = std::strchr(signature, ' ');
+    start = start != nullptr ? start + 1 : signature;
+    const char* end = std::strchr(start, ' ');
+    return Port_String(start, static_cast<int32_t>(end != nullptr ? end - start : std::strlen(start)));
+}
+
+}  // namespace
+
+MatchSession::~MatchSession() {
+    m_matcher.Release();
+    m_valid.Release();
+    m_matches.Release();
+}
+
+int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count) {
+    static const Port_String kSupport("libTcltask_Support");
+    static const Port_String kArgMatch("libArgMatchKit");
+    const bool loaded = CitP::Factory::LoadLibraryFactory(kSupport) && CitP::Factory::LoadLibraryFactory(kArgMatch);
+    m_matcher = CommonI::RefCountPtr<ICmdArgMatcher>(CitP::Factory::CreateInstanceRef(CmdArgMatcherID));
+    m_matches = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));
+    m_valid = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));
+    if (!loaded || !m_matcher || !m_matches || !m_valid)
+        return ReportWithoutReset(interp, "Error loading command argument matcher component library or while "
+                                          "creating the command matcher component.");
+    for (size_t i = 0; i < count; ++i) m_valid->Add(Port_String(options[i].name));
+    return 0;
+}
+
+Script::Handle* MatchSession::MakeWord(const Port_String& text, Tcl_Interp* interp) {
+    if (m_wordsMade < kInlineWords) return &m_inlineWords[m_wordsMade++].emplace(text.c_str(), interp);
+    m_heapWords.push_back(std::make_unique<Script::TclStringHandle>(text.c_str(), interp));
+    return m_heapWords.back().get();
+}
+
+int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv, int firstOption) {
+    if (argc > kInlineWords) {
+        m_heapSlots.resize(static_cast<size_t>(argc));
+        m_slots = m_heapSlots.data();
+    }
+    for (int i = 0; i < argc; ++i) {
+        const char* text = argv[i]->GetString();
+        if (i < firstOption || text == nullptr || text[0] != '-') {
+            m_slots[i] = argv[i];
+            continue;
+        }
+        Port_String typed(text);
+        typed.Trim("-", Port::TrimLeadingOnce);
+        CommonI::RefCountPtr<IOptionNameIterator> candidates;
+        if (m_valid->GetIterator(candidates) != 1 || !candidates)
+            return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+        CommonI::RESULT matched;
+        {
+            CommonI::RefCountPtr<IOptionNameSource> source(candidates);
+            matched = m_matcher->Match(typed, source, m_matches);
+        }
+        if (matched != 1 || !m_matches)
+            return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+        const int32_t found = m_matches->Size();
+        if (found == 0) return NoMatch(interp, typed);
+        if (found > 1) return Ambiguous(interp, typed);
+        CommonI::RefCountPtr<IOptionNameIterator> match;
+        m_matches->GetIterator(match);
+        match->First();
+        m_slots[i] = MakeWord(Port_String("-", match->Current().c_str()), interp);
+    }
+    return 0;
+}
+
+int MatchSession::NoMatch(Tcl_Interp* interp, const Port_String& typed) {
+    Port_String text = Translate("Optional argument '%s' does not match with any of valid optional arguments.\n"
+                                 "Please specify one of the following options\n",
+                                 typed.c_str());
+    AppendNames(text, m_valid.get(), "   -", "\n");
+    return ReportWithoutReset(interp, text);
+}
+
+// The candidates are put together for the message's arguments, which its format does not show.
+int MatchSession::Ambiguous(Tcl_Interp* interp, const Port_String& typed) {
+    Port_String candidates;
+    AppendNames(candidates, m_matches.get(), " \"-", "\" ");
+    return ReportWithoutReset(interp, Translate("Ambiguous optional argument 'errors\n", typed.c_str(), candidates.c_str()));
+}
+
+int FindOption(const char* name, const Option* options, size_t count) {
+    for (size_t i = 0; i < count; ++i)
+        if (std::strcmp(name, options[i].name) == 0) return static_cast<int>(i);
+    return -1;
+}
+
+int PositionalScan(int argc, Script::Handle* const* words, const Option* options, size_t count) {
+    for (int i = 2; i < argc; ++i) {
+        const char* text = WordText(words[i]);
+        if (text[0] == '-' && FindOption(text + 1, options, count) >= 0) return i;
+    }
+    return argc;
+}
+
+void MakeDefaultLine(DefaultLine& out, const char* className, const char* word, const Option& option, bool matched) {
+    const Port_String variable = matched ? Port_String("__", option.name, "__") : Port_String(option.name);
+    const Port_String line("namespace eval ", className, "::", word, " {set ", variable.c_str(), " ",
+                           option.defaultText, "}");
+    const Port_String qualified(className, "::", word, "::", variable.c_str());
+    out.line = Tcl_NewStringObj(line.c_str(), line.Length());
+    Tcl_IncrRefCount(out.line);
+    out.variable = Tcl_NewStringObj(qualified.c_str(), qualified.Length());
+    Tcl_IncrRefCount(out.variable);
+}
+
+int RunDefaultLine(Tcl_Interp* interp, const DefaultLine& line) { return Tcl_EvalObjEx(interp, line.line, 0); }
+
+int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord) {
+    return ErrorReport(interp, Port_String("\nFailure(s) took place while retrieving the default value for ",
+                                           "\noptional argument '", name, "' of type '", typeWord, "'"));
+}
+
+int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord) {
+    return ErrorReport(interp,
+                       Port_String("\nOptional argument '", name, "' of type '", typeWord, "' expects a value"));
+}
+
+int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature) {
+    return ErrorReportWithHelp(interp,
+                               Port_String("The current argument \"", word,
+                                           "\" is not an optional argument switch as expected."),
+                               object, OperationName(signature).c_str());
+}
+
+int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature) {
+    return ErrorReportWithHelp(interp, Port_String("Unrecognized optional argument \"-", name, "\""), object,
+                               OperationName(signature).c_str());
+}
+
+}  // namespace TcltaskI

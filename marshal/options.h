@@ -1,0 +1,86 @@
+// The option passes of the matched and switch frames that do not depend on a command's types: the
+// matcher set-up, the matching pass, the positional scan, the default lines and the texts of the
+// option failures.
+#pragma once
+
+#include <tcl.h>
+
+#include <memory>
+#include <optional>
+#include <vector>
+
+#include "ArgMatch/ICmdArgMatcher.h"
+#include "Script/Handle.h"
+#include "marshal/declare.h"
+
+namespace TcltaskI {
+
+// The matcher, its two name lists and the matched vector of one call. On destruction it gives back
+// the matcher, the list of valid names and the list of matches, in that order, and frees the
+// handles the matching pass made.
+class MatchSession {
+public:
+    MatchSession() = default;
+    MatchSession(const MatchSession&) = delete;
+    MatchSession& operator=(const MatchSession&) = delete;
+    ~MatchSession();
+
+    // Requests the component libraries, makes the matcher and the lists, and adds the option names.
+    // 0, or 1 after the loader failure has been reported.
+    int SetUp(Tcl_Interp* interp, const Option* options, size_t count);
+    // Fills the matched vector: words below the first option position and words without a dash stay
+    // as they are, every other word becomes the full name of the one option it abbreviates.
+    // 0, or 1 after the failure has been reported.
+    int Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv, int firstOption);
+    Script::Handle* const* Vector() const { return m_slots; }
+
+private:
+    static constexpr int kInlineWords = 16;
+
+    int NoMatch(Tcl_Interp* interp, const Port_String& typed);
+    int Ambiguous(Tcl_Interp* interp, const Port_String& typed);
+    Script::Handle* MakeWord(const Port_String& text, Tcl_Interp* interp);
+
+    CommonI::RefCountPtr<ICmdArgMatcher> m_matcher;
+    CommonI::RefCountPtr<IOptionNameList> m_matches;
+    CommonI::RefCountPtr<IOptionNameList> m_valid;
+
+    Script::Handle* m_inlineSlots[kInlineWords];
+    std::vector<Script::Handle*> m_heapSlots;
+    Script::Handle** m_slots = m_inlineSlots;
+    std::optional<Script::TclStringHandle> m_inlineWords[kInlineWords];
+    int m_wordsMade = 0;
+    std::vector<std::unique_ptr<Script::TclStringHandle>> m_heapWords;
+};
+
+// The position of the first word that, without its leading dash, is exactly a declared name; argc
+// when there is none.
+int PositionalScan(int argc, Script::Handle* const* words, const Option* options, size_t count);
+// The index of the declared option named `name`, or -1.
+int FindOption(const char* name, const Option* options, size_t count);
+
+// The text of a word, never null.
+inline const char* WordText(Script::Handle* handle) {
+    const char* text = handle->GetString();
+    return text != nullptr ? text : "";
+}
+
+// The default line of one option and the name of its variable, made once per thread and kept, so
+// that Tcl reuses the compiled line on every call.
+struct DefaultLine {
+    Tcl_Obj* line = nullptr;
+    Tcl_Obj* variable = nullptr;
+};
+// "namespace eval <class>::<word> {set <var> <default>}" and "<class>::<word>::<var>", with <var>
+// the name in two underscores either side in a matched method and bare in a switch method. The
+// class name loses its leading "TcltaskI::" nowhere: the namespaces are relative.
+void MakeDefaultLine(DefaultLine& out, const char* className, const char* word, const Option& option, bool matched);
+// Runs the line, as Tcl_Eval of its text would; gives the Tcl code.
+int RunDefaultLine(Tcl_Interp* interp, const DefaultLine& line);
+
+int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord);
+int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord);
+int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature);
+int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature);
+
+}  // namespace TcltaskI
