@@ -140,8 +140,10 @@ public:
         return {D.word, &TclWrap::template Method<D>, D.required, static_cast<int32_t>(D.options.size()), D.signature};
     }
 
-    static constexpr Entry GetInterfaceRow() {
-        return {"GetInterface", &TclWrap::GetInterface, 1, 0, "CitI::IInterface * GetInterface in "};
+    // A command table: the declared commands in the interface's order, then GetInterface.
+    template <const auto&... D>
+    static constexpr std::array<Entry, sizeof...(D) + 1> Rows() {
+        return {Row<D>()..., Entry{"GetInterface", &TclWrap::GetInterface, 1, 0, "CitI::IInterface * GetInterface in "}};
     }
 
 private:

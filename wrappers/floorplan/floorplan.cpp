@@ -33,33 +33,10 @@ constexpr auto zoom = Matched("zoom", 2, "UtilI::MITclProperty zoom in in ", &I:
 constexpr auto refresh = Matched("refresh", 0, "UtilI::MITclProperty refresh ", &I::refresh);
 
 using W = TclWrapIXFloorplan;
-const W::Entry rows[] = {
-    W::Row<open>(),
-    W::Row<open_full>(),
-    W::Row<open_empty>(),
-    W::Row<close>(),
-    W::Row<save>(),
-    W::Row<import>(),
-    W::Row<export_>(),
-    W::Row<group>(),
-    W::Row<ungroup>(),
-    W::Row<properties>(),
-    W::Row<get>(),
-    W::Row<set>(),
-    W::Row<block_properties>(),
-    W::Row<block_get>(),
-    W::Row<block_set_constraint>(),
-    W::Row<block_delete_constraint>(),
-    W::Row<prohibit>(),
-    W::Row<allow>(),
-    W::Row<drc>(),
-    W::Row<sso_analysis>(),
-    W::Row<clock_analysis>(),
-    W::Row<make_pin_compatible>(),
-    W::Row<zoom>(),
-    W::Row<refresh>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<open, open_full, open_empty, close, save, import, export_, group, ungroup,
+                               properties, get, set, block_properties, block_get, block_set_constraint,
+                               block_delete_constraint, prohibit, allow, drc, sso_analysis, clock_analysis,
+                               make_pin_compatible, zoom, refresh>();
 
 }  // namespace
 

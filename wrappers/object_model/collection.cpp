@@ -18,19 +18,8 @@ constexpr auto get = Matched("get", 1, "UtilI::MITclProperty get in ", &I::get);
 constexpr auto properties = Matched("properties", 0, "UtilI::MITclProperty properties ", &I::properties);
 
 using W = TclWrapICollection;
-const W::Entry rows[] = {
-    W::Row<append_to>(),
-    W::Row<equal>(),
-    W::Row<copy>(),
-    W::Row<foreach>(),
-    W::Row<index>(),
-    W::Row<remove_from>(),
-    W::Row<sizeof_>(),
-    W::Row<set>(),
-    W::Row<get>(),
-    W::Row<properties>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<append_to, equal, copy, foreach, index, remove_from, sizeof_, set, get,
+                               properties>();
 
 }  // namespace
 

@@ -12,13 +12,7 @@ constexpr auto get = Matched("get", 1, "UtilI::MITclProperty get in ", &I::get);
 constexpr auto properties = Matched("properties", 0, "UtilI::MITclProperty properties ", &I::properties);
 
 using W = TclWrapIGlobal;
-const W::Entry rows[] = {
-    W::Row<set>(),
-    W::Row<unset>(),
-    W::Row<get>(),
-    W::Row<properties>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<set, unset, get, properties>();
 
 }  // namespace
 

@@ -12,13 +12,7 @@ constexpr auto get = Matched("get", 2, "UtilI::MITclProperty get in in ", &I::ge
 constexpr auto properties = Matched("properties", 1, "UtilI::MITclProperty properties in ", &I::properties, Option{"descriptors", "false"});
 
 using W = TclWrapIObject;
-const W::Entry rows[] = {
-    W::Row<name>(),
-    W::Row<type>(),
-    W::Row<get>(),
-    W::Row<properties>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<name, type, get, properties>();
 
 }  // namespace
 

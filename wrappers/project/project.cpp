@@ -19,19 +19,8 @@ constexpr auto UnRegisterComponent = Plain("UnRegisterComponent", 1, "CommonI::R
 constexpr auto GetComponent = Plain("GetComponent", 1, "CitI::MIInterface GetComponent in ", &I::GetComponent);
 
 using W = TclWrapITclProject;
-const W::Entry rows[] = {
-    W::Row<OpenWithHelper>(),
-    W::Row<Close>(),
-    W::Row<GetFileName>(),
-    W::Row<GetHDProject>(),
-    W::Row<GetProjectHelper>(),
-    W::Row<Sync>(),
-    W::Row<Reload>(),
-    W::Row<RegisterComponent>(),
-    W::Row<UnRegisterComponent>(),
-    W::Row<GetComponent>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<OpenWithHelper, Close, GetFileName, GetHDProject, GetProjectHelper, Sync,
+                               Reload, RegisterComponent, UnRegisterComponent, GetComponent>();
 
 }  // namespace
 

@@ -17,18 +17,8 @@ constexpr auto SyncCurrent = Plain("SyncCurrent", 1, "CommonI::RESULT SyncCurren
 constexpr auto ReloadCurrent = Plain("ReloadCurrent", 1, "CommonI::RESULT ReloadCurrent out ", &I::ReloadCurrent);
 
 using W = TclWrapITclProjectMgr;
-const W::Entry rows[] = {
-    W::Row<Open>(),
-    W::Row<OpenWithHelper>(),
-    W::Row<Close>(),
-    W::Row<CloseCurrent>(),
-    W::Row<GetCurrentTclProject>(),
-    W::Row<GetCurrentHDProject>(),
-    W::Row<GetCurrentProjectHelper>(),
-    W::Row<SyncCurrent>(),
-    W::Row<ReloadCurrent>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<Open, OpenWithHelper, Close, CloseCurrent, GetCurrentTclProject,
+                               GetCurrentHDProject, GetCurrentProjectHelper, SyncCurrent, ReloadCurrent>();
 
 }  // namespace
 

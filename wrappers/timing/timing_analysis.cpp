@@ -26,27 +26,9 @@ constexpr auto set_filter = Matched("set_filter", 4, "UtilI::MITclProperty set_f
 constexpr auto show_settings = Matched("show_settings", 1, "UtilI::MITclProperty show_settings in ", &I::show_settings);
 
 using W = TclWrapITimingAnalysis;
-const W::Entry rows[] = {
-    W::Row<properties>(),
-    W::Row<delete_>(),
-    W::Row<disable_constraints>(),
-    W::Row<disable_cpt>(),
-    W::Row<enable_constraints>(),
-    W::Row<get>(),
-    W::Row<enable_cpt>(),
-    W::Row<new_>(),
-    W::Row<reset>(),
-    W::Row<run>(),
-    W::Row<save_as>(),
-    W::Row<saveas>(),
-    W::Row<set>(),
-    W::Row<set_constraint>(),
-    W::Row<set_endpoints>(),
-    W::Row<set_query>(),
-    W::Row<set_filter>(),
-    W::Row<show_settings>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<properties, delete_, disable_constraints, disable_cpt, enable_constraints, get,
+                               enable_cpt, new_, reset, run, save_as, saveas, set, set_constraint,
+                               set_endpoints, set_query, set_filter, show_settings>();
 
 }  // namespace
 

@@ -21,13 +21,7 @@ constexpr auto next = Switch("next", 0, "UtilI::MITclProperty next ", &I::next);
 constexpr auto previous = Switch("previous", 0, "UtilI::MITclProperty previous ", &I::previous);
 
 using W = TclWrapIGraphicalView;
-const W::Entry rows[] = {
-    W::Row<zoom>(),
-    W::Row<pan>(),
-    W::Row<next>(),
-    W::Row<previous>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<zoom, pan, next, previous>();
 
 }  // namespace
 

@@ -11,10 +11,7 @@ constexpr auto search = Matched("search", 1, "UtilI::MITclProperty search in ", 
                                 Option{"exp", "false"}, Option{"type", "all"}, Option{"in", "project"});
 
 using W = TclWrapISearch;
-const W::Entry rows[] = {
-    W::Row<search>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<search>();
 
 }  // namespace
 

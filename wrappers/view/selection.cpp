@@ -16,17 +16,7 @@ constexpr auto get = Matched("get", 1, "UtilI::MITclProperty get in ", &I::get);
 constexpr auto properties = Matched("properties", 0, "UtilI::MITclProperty properties ", &I::properties, Option{"descriptors", "false"});
 
 using W = TclWrapISelection;
-const W::Entry rows[] = {
-    W::Row<add>(),
-    W::Row<remove>(),
-    W::Row<new_>(),
-    W::Row<current>(),
-    W::Row<clear>(),
-    W::Row<set>(),
-    W::Row<get>(),
-    W::Row<properties>(),
-    W::GetInterfaceRow(),
-};
+constexpr auto rows = W::Rows<add, remove, new_, current, clear, set, get, properties>();
 
 }  // namespace
 
