@@ -2,6 +2,7 @@
 #include <dlfcn.h>
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -11,6 +12,12 @@
 
 namespace {
 
+// Where ctest says the libraries are, else build/lib beside this program's build/bin.
+std::string LibraryDir() {
+    if (const char* dir = getenv("KELMAR_LIB")) return dir;
+    return std::filesystem::read_symlink("/proc/self/exe").parent_path().string() + "/../lib";
+}
+
 using CommonI::RefCountPtr;
 using Names = std::vector<std::string>;
 
@@ -19,8 +26,7 @@ bool g_knownBeforeOpen = true, g_knownAfterOpen = false;
 struct OpenFirst : ::testing::Environment {
     void SetUp() override {
         g_knownBeforeOpen = CitP::Factory::IsRegistered(CmdArgMatcherID);
-        const char* dir = getenv("KELMAR_LIB");  // set by ctest; else run from build/bin
-        dlopen((std::string(dir ? dir : "../lib") + "/libArgMatchKit.so").c_str(), RTLD_NOW);
+        dlopen((LibraryDir() + "/libArgMatchKit.so").c_str(), RTLD_NOW);
         g_knownAfterOpen = CitP::Factory::IsRegistered(CmdArgMatcherID) && CitP::Factory::IsRegistered(OptionNameListID);
     }
 };

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 #include <tcl.h>
 
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -12,14 +13,19 @@
 
 namespace {
 
+// Where ctest says the libraries are, else build/lib beside this program's build/bin.
+std::string LibraryDir() {
+    if (const char* dir = getenv("KELMAR_LIB")) return dir;
+    return std::filesystem::read_symlink("/proc/self/exe").parent_path().string() + "/../lib";
+}
+
 // Whether merely opening the library, before the factory's loader ever ran, made the class known.
 bool g_knownBeforeOpen = true, g_knownAfterOpen = false;
 struct TclAndOpenFirst : ::testing::Environment {
     void SetUp() override {
         Tcl_FindExecutable(nullptr);
         g_knownBeforeOpen = CitP::Factory::IsRegistered(UtilI::TclPropertyID);
-        const char* dir = getenv("KELMAR_LIB");  // set by ctest; else run from build/bin
-        dlopen((std::string(dir ? dir : "../lib") + "/libTcltask_Support.so").c_str(), RTLD_NOW);
+        dlopen((LibraryDir() + "/libTcltask_Support.so").c_str(), RTLD_NOW);
         g_knownAfterOpen = CitP::Factory::IsRegistered(UtilI::TclPropertyID);
     }
 };
