@@ -1,0 +1,189 @@
+// Counted pointers, the wrapper's helper, the wrapper factory and the wrapper's own handle steps.
+#include <gtest/gtest.h>
+#include <tcl.h>
+
+#include <vector>
+
+#include "Script/KelmarPkg.h"
+#include "Script/TTclWrapFactory.h"
+#include "wrappers/classes.h"
+
+namespace {
+
+using CommonI::RefCountPtr;
+
+// A counted object that logs its counting, and answers one task interface.
+class Counted final : public TcltaskI::ICollection {
+public:
+    explicit Counted(std::vector<std::string>* log) : m_log(log) {}
+    ~Counted() override { m_log->push_back("destroyed"); }
+
+    CitI::IInterface* GetInterface(const Port::XUID& id) override {
+        if (id == CommonI::IRefCountID) return &m_counter;
+        if (id == TcltaskI::ICollectionID || id == CitI::IInterfaceID) return this;
+        return nullptr;
+    }
+    long Count() const { return m_counter.Count(); }
+
+    CommonI::RESULT append_to(const Str&, const List&, bool, Out&, Msg&) override { return 1; }
+    CommonI::RESULT equal(const Prop&, const Prop&, bool, Out&, Msg&) override { return 1; }
+    CommonI::RESULT copy(const Prop&, Out&, Msg&) override { return 1; }
+    CommonI::RESULT foreach(const Str&, const Prop&, const Str&, Out&, Msg&) override { return 1; }
+    CommonI::RESULT index(const Prop&, int32_t, Out&, Msg&) override { return 1; }
+    CommonI::RESULT remove_from(const Str&, const List&, Out&, Msg&) override { return 1; }
+    CommonI::RESULT sizeof_(const Prop&, Out&, Msg&) override { return 1; }
+    CommonI::RESULT set(const Str&, const Prop&, Out&, Msg&) override { return 1; }
+    CommonI::RESULT get(const Str&, Out&, Msg&) override { return 1; }
+    CommonI::RESULT properties(Out&, Msg&) override { return 1; }
+
+private:
+    // Logs every step so that the order of adding and dropping can be checked.
+    class LoggingCounter final : public CommonI::IRefCount {
+    public:
+        explicit LoggingCounter(Counted* owner) : m_owner(owner) {}
+        CitI::IInterface* GetInterface(const Port::XUID& id) override { return m_owner->GetInterface(id); }
+        long AddRef() override {
+            m_owner->m_log->push_back("add");
+            return ++m_count;
+        }
+        long Release() override {
+            m_owner->m_log->push_back("drop");
+            const long left = --m_count;
+            if (left == 0) delete m_owner;
+            return left;
+        }
+        long Count() const { return m_count; }
+
+    private:
+        Counted* m_owner;
+        long m_count = 0;
+    };
+
+    std::vector<std::string>* m_log;
+    LoggingCounter m_counter{this};
+};
+
+TEST(RefCountPtr, CountsThroughTheCounterItAsksFor) {
+    std::vector<std::string> log;
+    auto* object = new Counted(&log);
+    {
+        RefCountPtr<TcltaskI::ICollection> first(object);
+        EXPECT_EQ(object->Count(), 1);
+        RefCountPtr<TcltaskI::ICollection> uncounted(object, false);
+        EXPECT_EQ(object->Count(), 1);
+        uncounted.Detach();
+        RefCountPtr<TcltaskI::ICollection> copy(first);
+        EXPECT_EQ(object->Count(), 2);
+        // From another interface: the source is asked for the target's identifier and keeps its own.
+        RefCountPtr<CitI::IInterface> root(first);
+        EXPECT_EQ(root.get(), static_cast<CitI::IInterface*>(object));
+        EXPECT_EQ(object->Count(), 3);
+        RefCountPtr<UtilI::ITclProperty> other(root);  // the object has no such interface
+        EXPECT_FALSE(other);
+    }
+    EXPECT_EQ(log.back(), "destroyed");
+}
+
+TEST(RefCountPtr, AssignmentAddsBeforeItDrops) {
+    std::vector<std::string> log;
+    auto* object = new Counted(&log);
+    RefCountPtr<TcltaskI::ICollection> only(object);
+    // Assigning the one reference to itself must not end the object on the way.
+    RefCountPtr<TcltaskI::ICollection>& alias = only;
+    only = alias;
+    EXPECT_EQ(object->Count(), 1);
+    EXPECT_EQ(log, (std::vector<std::string>{"add", "add", "drop"}));
+
+    RefCountPtr<TcltaskI::ICollection> empty;
+    only = empty;
+    EXPECT_EQ(log.back(), "destroyed");
+}
+
+TEST(RefCountPtr, AttachTakesNoReferenceAndNullCountsNothing) {
+    std::vector<std::string> log;
+    auto* object = new Counted(&log);
+    RefCountPtr<TcltaskI::ICollection> held(object);
+    RefCountPtr<TcltaskI::ICollection> attached;
+    attached.Attach(object);
+    EXPECT_EQ(object->Count(), 1);
+    attached.Detach();
+    RefCountPtr<TcltaskI::ICollection> null(nullptr);
+    RefCountPtr<CitI::IInterface> stillNull(null);
+    EXPECT_FALSE(stillNull);
+}
+
+class WrapperTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        Tcl_FindExecutable(nullptr);
+        interp = Tcl_CreateInterp();
+        Kelmarpkg_Init(interp);
+    }
+    void TearDown() override { Tcl_DeleteInterp(interp); }
+    Tcl_Interp* interp = nullptr;
+};
+
+TEST_F(WrapperTest, HelperNeverCounts) {
+    Script::TScriptHandleHelper<TcltaskI::TclWrapICollection> helper;
+    EXPECT_EQ(helper.GetInterface(CommonI::IRefCountID), nullptr);
+    EXPECT_EQ(helper.GetInterface(CitI::IScriptHandleID), &helper);
+    EXPECT_FALSE(helper.SetResult(interp));
+    EXPECT_FALSE(helper.SetVariable(interp, "x"));
+    { CitI::MIInterface counted(&helper); }  // nothing to add or drop: the helper survives
+    EXPECT_EQ(helper.GetHandle(), nullptr);
+}
+
+TEST_F(WrapperTest, FactoryMakesAWrapperHoldingOneReference) {
+    std::vector<std::string> log;
+    auto* object = new Counted(&log);
+    RefCountPtr<TcltaskI::ICollection> owner(object);
+    Script::TTclWrapFactory<TcltaskI::TclWrapICollection, TcltaskI::ICollection> factory;
+    EXPECT_EQ(factory.GetInterface(CitI::ITclWrapFactoryID), &factory);
+    EXPECT_EQ(factory.CreateInstance(TcltaskI::IGlobalID, object, interp), nullptr);
+    EXPECT_EQ(factory.CreateInstance(TcltaskI::ICollectionID, nullptr, interp), nullptr);
+    EXPECT_EQ(object->Count(), 1);
+
+    CitI::IInterface* helper = factory.CreateInstance(TcltaskI::ICollectionID, object, interp);
+    ASSERT_NE(helper, nullptr);
+    auto* script = static_cast<CitI::IScriptHandle*>(helper->GetInterface(CitI::IScriptHandleID));
+    ASSERT_EQ(script, helper);
+    auto* wrapper = dynamic_cast<TcltaskI::TclWrapICollection*>(script->GetHandle());
+    ASSERT_NE(wrapper, nullptr);
+    EXPECT_EQ(object->Count(), 2);
+    EXPECT_EQ(helper->GetInterface(CommonI::IRefCountID), nullptr);
+
+    // A plain handle of the type, not a wrapper; the shared handle is one object for any interpreter.
+    Script::Handle* plain = wrapper->NewHandle(interp);
+    EXPECT_EQ(dynamic_cast<TcltaskI::TclWrapICollection*>(plain), nullptr);
+    EXPECT_NE(dynamic_cast<Script::PtrHandle<TcltaskI::ICollection>*>(plain), nullptr);
+    delete plain;
+    Tcl_Interp* other = Tcl_CreateInterp();
+    EXPECT_EQ(wrapper->GetSharedHandle(), wrapper->GetSharedHandle());
+    TcltaskI::TclWrapICollection second(object, other);
+    EXPECT_EQ(second.GetSharedHandle(), wrapper->GetSharedHandle());
+    second.ReleaseValue();
+
+    // A copy takes a reference of its own; the destructor gives none back.
+    {
+        TcltaskI::TclWrapICollection copy(*wrapper);
+        EXPECT_EQ(object->Count(), 3);
+        copy.ReleaseValue();
+    }
+    EXPECT_EQ(object->Count(), 2);
+    wrapper->ReleaseValue();
+    delete wrapper;
+    EXPECT_EQ(object->Count(), 1);
+    Tcl_DeleteInterp(other);
+}
+
+TEST_F(WrapperTest, WrapperWithoutObjectCountsNothing) {
+    TcltaskI::TclWrapICollection orphan(nullptr, interp);
+    void* value = &orphan;
+    EXPECT_EQ(orphan.GetValue(&value), 1);
+    orphan.AddRefValue();
+    orphan.ReleaseValue();
+    EXPECT_EQ(orphan.GetScriptHandle(CitI::IInterfaceID), orphan.GetScriptHandle(CitI::IScriptHandleID));
+    EXPECT_EQ(orphan.GetScriptHandle(TcltaskI::ICollectionID), nullptr);
+}
+
+}  // namespace
