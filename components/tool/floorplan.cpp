@@ -1,0 +1,898 @@
+// The floorplan object: a working copy of the current design's blocks, prohibited sites and port
+// sites on a device, with its analyses and its view.
+//
+// The words of the operations whose meaning is the tool's own:
+//   open_full FILE FORM MODE   opens the design's floorplan and reads the constraint FILE of FORM
+//                              (ucf, csv, vhdl or vlog) into it: MODE replace puts the file's blocks
+//                              and prohibited sites in place of the design's, merge adds them.
+//   open_empty NAME DEVICE COLUMNS ROWS BANKS LAYOUT SSO_LIMIT SITE_CAPACITY CLOCK_LIMIT
+//                              opens a floorplan without blocks or prohibited sites on a new device:
+//                              COLUMNS x ROWS sites, BANKS banks of equal stripes along the LAYOUT
+//                              (columns or rows), each allowed SSO_LIMIT outputs (0: no limit), sites
+//                              holding SITE_CAPACITY cells, regions CLOCK_LIMIT clock nets (0: no
+//                              limit). Saving it gives the design that device.
+//   make_pin_compatible FROM TO OFFSET MODE
+//                              the ports of the list TO take the pin placement of the ports of the
+//                              list FROM, pair by pair: MODE copy places each on its partner's site
+//                              moved by OFFSET ("dx dy"), MODE swap exchanges the two sites (OFFSET
+//                              must then be "0 0" or empty). No two ports may end on one site.
+//   zoom SITE SITE             shows the sites between the two corners; zoom block NAME shows the
+//                              region of a block, zoom fit ANYTHING the whole device.
+#include <algorithm>
+#include <cstdlib>
+#include <fstream>
+#include <memory>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "TcltaskI/IXFloorplan.h"
+#include "component.h"
+#include "floorplan_model.h"
+#include "project.h"
+#include "property.h"
+
+namespace kelmartool {
+
+namespace {
+
+using Str = Port_String;
+using Out = UtilI::MITclProperty;
+using Msg = Port_String;
+using CommonI::RESULT;
+
+constexpr const char* kNotOpen = "no floorplan is open: open one with floorplan open";
+constexpr const char* kNameKey = "floorplan_name";
+constexpr const char* kClockLimitKey = "clock_limit";
+
+const std::vector<std::string> kProperties{"name",     "design",      "device", "columns",     "rows",
+                                           "site_capacity", "banks", "sso_limit", "clock_limit", "blocks",
+                                           "prohibited", "modified", "view"};
+const std::vector<std::string> kWritable{"name", "site_capacity", "sso_limit", "clock_limit"};
+const std::vector<std::string> kBlockProperties{"name", "cells", "size", "region", "capacity", "sites", "constraints"};
+
+std::string Quote(const std::string& name) { return "'" + name + "'"; }
+
+std::string Join(const std::vector<std::string>& words, const char* separator = ", ") {
+    std::string out;
+    for (const std::string& w : words) out += (out.empty() ? "" : separator) + w;
+    return out;
+}
+
+bool WholeNumber(const std::string& text, long long low, long long high, int& out) {
+    if (text.empty()) return false;
+    char* end = nullptr;
+    const long long n = std::strtoll(text.c_str(), &end, 10);
+    if (*end != '\0' || n < low || n > high) return false;
+    out = static_cast<int>(n);
+    return true;
+}
+
+std::vector<std::string> Words(const std::string& text) {
+    std::vector<std::string> words;
+    TclValue value(NewText(text));
+    int count = 0;
+    Tcl_Obj** items = nullptr;
+    if (Tcl_ListObjGetElements(nullptr, value.get(), &count, &items) == TCL_OK)
+        for (int i = 0; i < count; ++i) words.emplace_back(Tcl_GetString(items[i]));
+    return words;
+}
+
+// Sites in the order of the device: row by row.
+std::vector<std::string> SiteOrder(const std::set<std::string>& sites) {
+    std::vector<std::pair<std::pair<int, int>, std::string>> keyed;
+    for (const std::string& s : sites) {
+        int x = 0, y = 0;
+        ParseSiteName(s, x, y);
+        keyed.push_back({{y, x}, s});
+    }
+    std::sort(keyed.begin(), keyed.end());
+    std::vector<std::string> out;
+    for (auto& [key, s] : keyed) out.push_back(std::move(s));
+    return out;
+}
+
+Region WholeDevice(const Device& d) { return Region{0, 0, d.columns - 1, d.rows - 1}; }
+
+bool ReadFile(const std::string& file, std::string& text) {
+    std::ifstream in(file, std::ios::binary);
+    if (!in) return false;
+    std::ostringstream buffer;
+    buffer << in.rdbuf();
+    text = buffer.str();
+    return !in.bad();
+}
+
+std::optional<ConstraintForm> FormFromWord(const std::string& word) {
+    for (ConstraintForm f : {ConstraintForm::Ucf, ConstraintForm::Csv, ConstraintForm::Vhdl, ConstraintForm::Vlog})
+        if (word == FormWord(f)) return f;
+    return std::nullopt;
+}
+
+// Reads and parses one constraint file.
+bool Load(ConstraintForm form, const std::string& file, FloorplanConstraints& out, std::string& error) {
+    std::string text;
+    if (!ReadFile(file, text)) {
+        error = std::string("cannot read the ") + FormWord(form) + " file '" + file + "'";
+        return false;
+    }
+    if (!ParseConstraints(form, text, out, error)) {
+        error = "'" + file + "': " + error;
+        return false;
+    }
+    return true;
+}
+
+class Floorplan final : public Component<TcltaskI::IXFloorplan> {
+public:
+    explicit Floorplan(const StatePtr& state) : m_state(state) {}
+
+    RESULT open(Out& result, Msg& message) override {
+        StatePtr state;
+        FloorplanData fresh;
+        if (!Start(state, fresh, message)) return 0;
+        return Install(*state, std::move(fresh), result, message);
+    }
+
+    RESULT open_full(const Str& s1, const Str& s2, const Str& s3, Out& result, Msg& message) override {
+        StatePtr state;
+        FloorplanData fresh;
+        if (!Start(state, fresh, message)) return 0;
+        const std::string file = s1.c_str(), formWord = s2.c_str(), mode = s3.c_str();
+        const auto form = FormFromWord(formWord);
+        if (!form) return Fail(message, "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
+        if (mode != "replace" && mode != "merge") return Fail(message, "unknown mode '" + mode + "': use replace or merge");
+        FloorplanConstraints read;
+        std::string error;
+        if (!Load(*form, file, read, error)) return Fail(message, error);
+        if (mode == "replace") {
+            fresh.constraints.blocks.clear();
+            fresh.constraints.prohibited.clear();
+        }
+        MergeConstraints(fresh.constraints, read);
+        error = CheckConstraints(*state->CurrentDesign(), fresh.device, fresh.constraints);
+        if (!error.empty()) return Fail(message, "'" + file + "': " + error);
+        fresh.modified = true;
+        return Install(*state, std::move(fresh), result, message);
+    }
+
+    RESULT open_empty(const Str& s1, const Str& s2, const Str& s3, const Str& s4, const Str& s5, const Str& s6,
+                      const Str& s7, const Str& s8, const Str& s9, Out& result, Msg& message) override {
+        StatePtr state;
+        FloorplanData fresh;
+        if (!Start(state, fresh, message)) return 0;
+        const std::string name = s1.c_str(), device = s2.c_str(), layout = s6.c_str();
+        int columns = 0, rows = 0, banks = 0, sso = 0, capacity = 0, clocks = 0;
+        if (name.empty()) return Fail(message, "the floorplan needs a name");
+        if (device.empty()) return Fail(message, "the device needs a name");
+        if (!WholeNumber(s3.c_str(), 1, 100000, columns))
+            return Fail(message, "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
+        if (!WholeNumber(s4.c_str(), 1, 100000, rows))
+            return Fail(message, "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
+        if (layout != "columns" && layout != "rows")
+            return Fail(message, "unknown bank layout '" + layout + "': use columns or rows");
+        const int stripes = layout == "columns" ? columns : rows;
+        if (!WholeNumber(s5.c_str(), 1, stripes, banks))
+            return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(stripes) + ", not '" +
+                                     std::string(s5.c_str()) + "'");
+        if (!WholeNumber(s7.c_str(), 0, 1000000, sso))
+            return Fail(message, "the sso limit must be a whole number of at least 0, not '" + std::string(s7.c_str()) + "'");
+        if (!WholeNumber(s8.c_str(), 1, 1000000, capacity))
+            return Fail(message, "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
+        if (!WholeNumber(s9.c_str(), 0, 1000000, clocks))
+            return Fail(message, "the clock limit must be a whole number of at least 0, not '" + std::string(s9.c_str()) + "'");
+        Device d;
+        d.name = device;
+        d.columns = columns;
+        d.rows = rows;
+        d.siteCapacity = capacity;
+        for (int i = 0; i < banks; ++i) {
+            Bank b;
+            b.name = "BANK" + std::to_string(i);
+            const int first = static_cast<int>(static_cast<long long>(i) * stripes / banks);
+            const int last = static_cast<int>(static_cast<long long>(i + 1) * stripes / banks) - 1;
+            if (layout == "columns") b.x0 = first, b.x1 = last, b.y0 = 0, b.y1 = rows - 1;
+            else b.x0 = 0, b.x1 = columns - 1, b.y0 = first, b.y1 = last;
+            b.ssoLimit = sso;
+            d.banks.push_back(std::move(b));
+        }
+        fresh.name = name;
+        fresh.device = std::move(d);
+        fresh.constraints.blocks.clear();
+        fresh.constraints.prohibited.clear();
+        fresh.clockLimit = clocks;
+        fresh.view = WholeDevice(fresh.device);
+        fresh.modified = true;
+        return Install(*state, std::move(fresh), result, message);
+    }
+
+    RESULT close(bool nosave, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData& plan = Plan(*state);
+        if (!plan.open) return Fail(message, kNotOpen);
+        std::string file;
+        if (!nosave && !Commit(*state, file, message)) return 0;
+        if (!Answer(DictBuilder().Add("saved", !nosave).Add("file", file).Take(), result, message)) return 0;
+        plan = FloorplanData{};
+        return 1;
+    }
+
+    RESULT save(Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        std::string file;
+        if (!Commit(*state, file, message)) return 0;
+        return Answer(NewText(file), result, message);
+    }
+
+    RESULT import(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        FloorplanConstraints read;
+        bool any = false;
+        for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
+            FloorplanConstraints one;
+            std::string error;
+            if (!Load(form, file, one, error)) return Fail(message, error);
+            MergeConstraints(read, one);
+            any = true;
+        }
+        if (!any) return Fail(message, "nothing to import: give -ucf, -csv, -vhdl or -vlog with a file");
+        // The files' blocks and prohibited sites take the place of the floorplan's; ports they do not
+        // name stay where they are.
+        FloorplanConstraints changed = plan->constraints;
+        changed.blocks = read.blocks;
+        changed.prohibited = read.prohibited;
+        for (const auto& [port, site] : read.ports) changed.ports[port] = site;
+        if (std::string error = CheckConstraints(*state->CurrentDesign(), plan->device, changed); !error.empty())
+            return Fail(message, "the imported constraints do not fit: " + error);
+        Tcl_Obj* answer = DictBuilder()
+                              .Add("blocks", read.blocks.size())
+                              .Add("prohibited", read.prohibited.size())
+                              .Add("ports", read.ports.size())
+                              .Take();
+        if (!Answer(answer, result, message)) return 0;
+        plan->constraints = std::move(changed);
+        plan->modified = true;
+        return 1;
+    }
+
+    RESULT export_(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        std::vector<std::string> written;
+        for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
+            std::ofstream out(file, std::ios::binary | std::ios::trunc);
+            out << FormatConstraints(form, plan->constraints, state->CurrentDesign()->name);
+            out.close();
+            if (!out) return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "'");
+            written.push_back(file);
+        }
+        if (written.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
+        return Answer(NewList(written), result, message);
+    }
+
+    RESULT group(const Str& block, const Prop& cells, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        const std::string name = block.c_str();
+        if (name.empty() || name.find_first_of(" \t\n") != std::string::npos)
+            return Fail(message, "a block name must be one word, not '" + name + "'");
+        std::vector<std::string> names;
+        std::string error;
+        TclValue value = ValueOf(cells);
+        if (!value || !ResolveObjects(*state, value.get(), names, error)) return Fail(message, error);
+        if (names.empty()) return Fail(message, "block " + Quote(name) + " needs at least one cell");
+        const Design& design = *state->CurrentDesign();
+        FloorplanConstraints changed = plan->constraints;
+        auto it = std::find_if(changed.blocks.begin(), changed.blocks.end(), [&](const Block& b) { return b.name == name; });
+        if (it == changed.blocks.end()) {
+            changed.blocks.push_back(Block{});
+            it = std::prev(changed.blocks.end());
+            it->name = name;
+        }
+        for (const std::string& cell : names) {
+            if (!design.FindCell(cell)) return Fail(message, Quote(cell) + " is no cell");
+            for (const Block& other : changed.blocks)
+                if (other.name != name && std::find(other.cells.begin(), other.cells.end(), cell) != other.cells.end())
+                    return Fail(message, "cell " + Quote(cell) + " is in block " + Quote(other.name) + " already");
+            if (std::find(it->cells.begin(), it->cells.end(), cell) == it->cells.end()) it->cells.push_back(cell);
+        }
+        if (!Answer(NewList(it->cells), result, message)) return 0;
+        Keep(*plan, std::move(changed));
+        return 1;
+    }
+
+    RESULT ungroup(const Prop& block, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        std::vector<std::string> names;
+        if (!BlockNames(*plan, block, names, message)) return 0;
+        FloorplanConstraints changed = plan->constraints;
+        std::erase_if(changed.blocks, [&names](const Block& b) {
+            return std::find(names.begin(), names.end(), b.name) != names.end();
+        });
+        if (!Answer(NewList(BlockList(changed)), result, message)) return 0;
+        Keep(*plan, std::move(changed));
+        return 1;
+    }
+
+    RESULT properties(Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        DictBuilder d;
+        for (const std::string& key : kProperties) d.Add(key, Property(*state, *plan, key));
+        return Answer(d.Take(), result, message);
+    }
+
+    RESULT get(const Str& name, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        const std::string key = name.c_str();
+        if (key == "open") return Answer(NewBool(Plan(*state).open), result, message);
+        if (std::find(kProperties.begin(), kProperties.end(), key) == kProperties.end()) return Unknown(key, message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        return Answer(Property(*state, *plan, key), result, message);
+    }
+
+    RESULT set(const Str& name, const Str& value, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        const std::string key = name.c_str(), text = value.c_str();
+        if (std::find(kWritable.begin(), kWritable.end(), key) == kWritable.end()) {
+            if (key == "open" || std::find(kProperties.begin(), kProperties.end(), key) != kProperties.end())
+                return Fail(message, "the floorplan setting '" + key + "' is read-only");
+            return Unknown(key, message);
+        }
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        FloorplanData changed = *plan;
+        int number = 0;
+        if (key == "name") {
+            if (text.empty()) return Fail(message, "the floorplan needs a name");
+            changed.name = text;
+        } else if (key == "site_capacity") {
+            if (!WholeNumber(text, 1, 1000000, number))
+                return Fail(message, "the site capacity must be a whole number from 1, not '" + text + "'");
+            changed.device.siteCapacity = number;
+        } else if (key == "clock_limit") {
+            if (!WholeNumber(text, 0, 1000000, number))
+                return Fail(message, "the clock limit must be a whole number of at least 0, not '" + text + "'");
+            changed.clockLimit = number;
+        } else if (WholeNumber(text, 0, 1000000, number)) {
+            for (Bank& b : changed.device.banks) b.ssoLimit = number;
+        } else {
+            // A dict of bank and limit sets the named banks only.
+            const auto words = Words(text);
+            if (words.empty() || words.size() % 2 != 0)
+                return Fail(message, "the sso limit is a whole number for every bank, or a dict of bank and number");
+            for (std::size_t i = 0; i < words.size(); i += 2) {
+                auto bank = std::find_if(changed.device.banks.begin(), changed.device.banks.end(),
+                                         [&](const Bank& b) { return b.name == words[i]; });
+                if (bank == changed.device.banks.end()) return Fail(message, Quote(words[i]) + " is no bank of the device");
+                if (!WholeNumber(words[i + 1], 0, 1000000, bank->ssoLimit))
+                    return Fail(message, "the sso limit of " + Quote(words[i]) +
+                                             " must be a whole number of at least 0, not '" + words[i + 1] + "'");
+            }
+        }
+        if (!Answer(Property(*state, changed, key), result, message)) return 0;
+        changed.modified = true;
+        *plan = std::move(changed);
+        return 1;
+    }
+
+    RESULT block_properties(Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        DictBuilder d;
+        for (const Block& b : plan->constraints.blocks) d.Add(b.name, BlockValue(*plan, b));
+        return Answer(d.Take(), result, message);
+    }
+
+    RESULT block_get(const Prop& block, const Str& name, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        std::vector<std::string> names;
+        if (!BlockNames(*plan, block, names, message)) return 0;
+        const std::string key = name.c_str();
+        const bool builtIn = std::find(kBlockProperties.begin(), kBlockProperties.end(), key) != kBlockProperties.end();
+        for (const std::string& n : names)
+            if (!builtIn && !FindBlock(*plan, n)->constraints.count(key))
+                return Fail(message, "block " + Quote(n) + " has no property or constraint " + Quote(key) +
+                                         "; its properties are " + Join(kBlockProperties));
+        auto valueOf = [&](const std::string& n) {
+            const Block& b = *FindBlock(*plan, n);
+            return builtIn ? BlockProperty(*plan, b, key) : NewText(b.constraints.at(key));
+        };
+        if (names.size() == 1) return Answer(valueOf(names.front()), result, message);
+        DictBuilder several;
+        for (const std::string& n : names) several.Add(n, valueOf(n));
+        return Answer(several.Take(), result, message);
+    }
+
+    RESULT block_set_constraint(const Prop& block, const Str& name, const Str& value, Out& result,
+                                Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        std::vector<std::string> names;
+        if (!BlockNames(*plan, block, names, message)) return 0;
+        const std::string key = name.c_str(), text = value.c_str();
+        if (std::string problem = CheckBlockConstraint(key, text); !problem.empty()) return Fail(message, problem);
+        FloorplanConstraints changed = plan->constraints;
+        for (Block& b : changed.blocks) {
+            if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
+            if (key == "region") {
+                Region r;
+                std::string ignored;
+                ParseRegion(text, r, ignored);
+                SetRegion(b, r);
+            } else {
+                b.constraints[key] = key == "capacity" ? std::to_string(std::strtoll(text.c_str(), nullptr, 10)) : text;
+            }
+        }
+        return AnswerBlocks(*plan, std::move(changed), names, result, message);
+    }
+
+    RESULT block_delete_constraint(const Prop& block, const Str& name, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        std::vector<std::string> names;
+        if (!BlockNames(*plan, block, names, message)) return 0;
+        const std::string key = name.c_str();
+        FloorplanConstraints changed = plan->constraints;
+        for (Block& b : changed.blocks) {
+            if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
+            const bool had = key == "region" ? RegionOf(b).has_value() : b.constraints.erase(key) > 0;
+            if (!had) return Fail(message, "block " + Quote(b.name) + " has no constraint " + Quote(key));
+            if (key == "region") SetRegion(b, std::nullopt);
+        }
+        return AnswerBlocks(*plan, std::move(changed), names, result, message);
+    }
+
+    RESULT prohibit(const Prop& sites, Out& result, Msg& message) override { return SwitchSites(sites, true, result, message); }
+
+    RESULT allow(const Prop& sites, Out& result, Msg& message) override { return SwitchSites(sites, false, result, message); }
+
+    RESULT drc(Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+        for (const DrcFinding& f : RunDrc(*state->CurrentDesign(), *plan))
+            Tcl_ListObjAppendElement(
+                nullptr, list,
+                DictBuilder().Add("rule", f.rule).Add("objects", NewList(f.objects)).Add("message", f.message).Take());
+        return Answer(list, result, message);
+    }
+
+    RESULT sso_analysis(Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+        for (const SsoBank& b : RunSso(*state->CurrentDesign(), *plan)) {
+            const bool over = b.limit > 0 && static_cast<int>(b.outputs.size()) > b.limit;
+            Tcl_ListObjAppendElement(nullptr, list,
+                                     DictBuilder()
+                                         .Add("bank", b.bank)
+                                         .Add("outputs", b.outputs.size())
+                                         .Add("limit", b.limit)
+                                         .Add("status", over ? "over" : "ok")
+                                         .Add("ports", NewList(b.outputs))
+                                         .Take());
+        }
+        return Answer(list, result, message);
+    }
+
+    RESULT clock_analysis(Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+        for (const ClockRegion& r : RunClockAnalysis(*state->CurrentDesign(), *plan)) {
+            const bool over = plan->clockLimit > 0 && static_cast<int>(r.nets.size()) > plan->clockLimit;
+            Tcl_ListObjAppendElement(nullptr, list,
+                                     DictBuilder()
+                                         .Add("block", r.block)
+                                         .Add("region", RegionText(r.region))
+                                         .Add("nets", NewList(r.nets))
+                                         .Add("count", r.nets.size())
+                                         .Add("limit", plan->clockLimit)
+                                         .Add("status", over ? "over" : "ok")
+                                         .Take());
+        }
+        return Answer(list, result, message);
+    }
+
+    RESULT make_pin_compatible(const Str& s1, const Str& s2, const Str& s3, const Str& s4, Out& result,
+                               Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        const auto from = Words(s1.c_str()), to = Words(s2.c_str()), offset = Words(s3.c_str());
+        const std::string mode = s4.c_str();
+        if (mode != "copy" && mode != "swap") return Fail(message, "unknown mode '" + mode + "': use copy or swap");
+        if (from.empty() || from.size() != to.size())
+            return Fail(message, "the two port lists must be of the same length, and not empty");
+        int dx = 0, dy = 0;
+        if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -100000, 100000, dx) ||
+                                !WholeNumber(offset[1], -100000, 100000, dy)))
+            return Fail(message, "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
+        if (mode == "swap" && (dx != 0 || dy != 0)) return Fail(message, "swap moves no pin by an offset: give \"0 0\"");
+        const Design& design = *state->CurrentDesign();
+        std::set<std::string> seen;
+        for (const std::string& p : from) seen.insert(p);
+        for (const std::string& p : to)
+            if (!seen.insert(p).second) return Fail(message, "port " + Quote(p) + " is named twice");
+        auto sites = plan->constraints.ports;
+        DictBuilder moved;
+        for (std::size_t i = 0; i < from.size(); ++i) {
+            for (const std::string* p : {&from[i], &to[i]})
+                if (!design.FindPort(*p)) return Fail(message, Quote(*p) + " is no port of the design");
+            const auto source = plan->constraints.ports.find(from[i]);
+            if (source == plan->constraints.ports.end()) return Fail(message, "port " + Quote(from[i]) + " is not placed");
+            if (mode == "swap") {
+                const auto target = plan->constraints.ports.find(to[i]);
+                if (target == plan->constraints.ports.end()) return Fail(message, "port " + Quote(to[i]) + " is not placed");
+                sites[to[i]] = source->second;
+                sites[from[i]] = target->second;
+                continue;
+            }
+            int x = 0, y = 0;
+            ParseSiteName(source->second, x, y);
+            if (!plan->device.OnDevice(x + dx, y + dy))
+                return Fail(message, "port " + Quote(to[i]) + " would leave the device: " + source->second + " moved by " +
+                                         std::to_string(dx) + " " + std::to_string(dy));
+            sites[to[i]] = Device::SiteName(x + dx, y + dy);
+        }
+        std::map<std::string, std::string> holder;  // site -> port
+        for (const auto& [port, site] : sites) {
+            auto [it, fresh] = holder.emplace(site, port);
+            if (!fresh)
+                return Fail(message, "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
+            const auto before = plan->constraints.ports.find(port);
+            const bool changed = before == plan->constraints.ports.end() || before->second != site;
+            if (changed && plan->constraints.prohibited.count(site))
+                return Fail(message, "port " + Quote(port) + " would be placed on the prohibited site " + site);
+            if (changed) moved.Add(port, site);
+        }
+        if (!Answer(moved.Take(), result, message)) return 0;
+        plan->constraints.ports = std::move(sites);
+        plan->modified = true;
+        return 1;
+    }
+
+    RESULT zoom(const Str& left, const Str& right, Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        const std::string a = left.c_str(), b = right.c_str();
+        Region view;
+        if (a == "fit") {
+            view = WholeDevice(plan->device);
+        } else if (a == "block") {
+            const Block* block = FindBlock(*plan, b);
+            if (!block) return Fail(message, "no block named " + Quote(b));
+            const auto region = RegionOf(*block);
+            if (!region) return Fail(message, "block " + Quote(b) + " has no region to show");
+            view = Clamp(*region, plan->device);
+        } else {
+            const auto p = plan->device.ParseSite(a), q = plan->device.ParseSite(b);
+            if (!p || !q)
+                return Fail(message, "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
+            view = Region{std::min(p->x, q->x), std::min(p->y, q->y), std::max(p->x, q->x), std::max(p->y, q->y)};
+        }
+        if (!Answer(ViewValue(*plan, view), result, message)) return 0;
+        plan->view = view;
+        return 1;
+    }
+
+    RESULT refresh(Out& result, Msg& message) override {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        // The device may have changed under the view; what no longer lies on it is dropped.
+        Region view = Clamp(plan->view, plan->device);
+        if (!Answer(ViewValue(*plan, view), result, message)) return 0;
+        plan->view = view;
+        return 1;
+    }
+
+private:
+    static RESULT Gone(Msg& message) { return Fail(message, "the tool state of this interpreter is gone"); }
+
+    static FloorplanData& Plan(ToolState& state) {
+        if (!state.floorplan) state.floorplan = std::make_shared<FloorplanData>();
+        return *state.floorplan;
+    }
+
+    // The open floorplan, when it belongs to the design that is current now.
+    static FloorplanData* Ready(ToolState& state, Msg& message) {
+        FloorplanData& plan = Plan(state);
+        if (!plan.open) {
+            Fail(message, kNotOpen);
+            return nullptr;
+        }
+        if (!state.CurrentDesign()) {
+            Fail(message, kNoProject);
+            return nullptr;
+        }
+        if (plan.epoch != state.designEpoch) {
+            Fail(message, "the design changed since the floorplan was opened: close it with -nosave and open it again");
+            return nullptr;
+        }
+        return &plan;
+    }
+
+    // A floorplan made from the current design, when none is open yet.
+    bool Start(StatePtr& state, FloorplanData& fresh, Msg& message) {
+        state = m_state.lock();
+        if (!state) return Gone(message) != 0;
+        if (Plan(*state).open) return Fail(message, "the floorplan is open already: close it first") != 0;
+        const Design* design = state->CurrentDesign();
+        if (!design) return Fail(message, kNoProject) != 0;
+        fresh.open = true;
+        fresh.epoch = state->designEpoch;
+        auto name = design->properties.find(kNameKey);
+        fresh.name = name != design->properties.end() ? name->second : design->name;
+        fresh.device = design->device;
+        fresh.constraints.blocks = design->blocks;
+        fresh.constraints.prohibited = design->prohibited;
+        for (const IoPort& p : design->ports)
+            if (!p.site.empty()) fresh.constraints.ports[p.name] = p.site;
+        if (auto limit = design->properties.find(kClockLimitKey); limit != design->properties.end())
+            WholeNumber(limit->second, 0, 1000000, fresh.clockLimit);
+        fresh.view = WholeDevice(fresh.device);
+        return true;
+    }
+
+    RESULT Install(ToolState& state, FloorplanData fresh, Out& result, Msg& message) {
+        DictBuilder d;
+        for (const std::string& key : kProperties) d.Add(key, Property(state, fresh, key));
+        if (!Answer(d.Take(), result, message)) return 0;
+        Plan(state) = std::move(fresh);
+        return 1;
+    }
+
+    // Puts the working copy into the design and writes the project file; on any failure the design
+    // is as it was.
+    static bool Commit(ToolState& state, std::string& file, Msg& message) {
+        FloorplanData* plan = Ready(state, message);
+        if (!plan) return false;
+        ProjectComponent* project = state.Current();
+        Design& design = *project->GetDesign();
+        for (const Block& b : plan->constraints.blocks)
+            if (auto r = RegionOf(b); r && !(plan->device.OnDevice(r->x0, r->y0) && plan->device.OnDevice(r->x1, r->y1)))
+                return Fail(message, "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
+                                         RegionText(*r) + ", which reaches beyond the device") != 0;
+        Design before = design;
+        design.device = plan->device;
+        design.blocks = plan->constraints.blocks;
+        design.prohibited = plan->constraints.prohibited;
+        bool moved = before.device.name != design.device.name || before.device.columns != design.device.columns ||
+                     before.device.rows != design.device.rows;
+        for (IoPort& p : design.ports) {
+            auto it = plan->constraints.ports.find(p.name);
+            const std::string site = it == plan->constraints.ports.end() ? std::string() : it->second;
+            moved = moved || site != p.site;
+            p.site = site;
+        }
+        if (plan->name != design.name) design.properties[kNameKey] = plan->name;
+        else design.properties.erase(kNameKey);
+        if (plan->clockLimit > 0) design.properties[kClockLimitKey] = std::to_string(plan->clockLimit);
+        else design.properties.erase(kClockLimitKey);
+        std::string problem = design.Index();
+        Port_String written;
+        if (problem.empty() && project->Sync(written) != 1) problem = written.c_str();
+        if (!problem.empty()) {
+            design = std::move(before);
+            design.Index();
+            return Fail(message, "the floorplan cannot be saved: " + problem) != 0;
+        }
+        file = project->File();
+        if (moved) state.DesignChanged();
+        plan->epoch = state.designEpoch;
+        plan->modified = false;
+        return true;
+    }
+
+    static std::vector<std::pair<ConstraintForm, std::string>> Files(const Str& ucf, const Str& csv, const Str& vhdl,
+                                                                     const Str& vlog) {
+        std::vector<std::pair<ConstraintForm, std::string>> files;
+        const std::pair<ConstraintForm, const Str*> given[] = {{ConstraintForm::Ucf, &ucf},
+                                                               {ConstraintForm::Csv, &csv},
+                                                               {ConstraintForm::Vhdl, &vhdl},
+                                                               {ConstraintForm::Vlog, &vlog}};
+        for (const auto& [form, file] : given)
+            if (!file->IsEmpty()) files.emplace_back(form, file->c_str());
+        return files;
+    }
+
+    static RESULT Unknown(const std::string& key, Msg& message) {
+        return Fail(message, "no floorplan setting '" + key + "'; the settings are: open, " + Join(kProperties));
+    }
+
+    static const Block* FindBlock(const FloorplanData& plan, const std::string& name) {
+        for (const Block& b : plan.constraints.blocks)
+            if (b.name == name) return &b;
+        return nullptr;
+    }
+
+    static std::vector<std::string> BlockList(const FloorplanConstraints& c) {
+        std::vector<std::string> names;
+        for (const Block& b : c.blocks) names.push_back(b.name);
+        return names;
+    }
+
+    static bool BlockNames(const FloorplanData& plan, const Prop& value, std::vector<std::string>& names, Msg& message) {
+        if (!WordsOf(value, names)) return Fail(message, "the blocks are no proper list") != 0;
+        if (names.empty()) return Fail(message, "no block given") != 0;
+        for (const std::string& n : names)
+            if (!FindBlock(plan, n)) {
+                const auto all = BlockList(plan.constraints);
+                return Fail(message, "no block named " + Quote(n) +
+                                         (all.empty() ? std::string("; the floorplan has no blocks")
+                                                      : "; the blocks are: " + Join(all))) != 0;
+            }
+        return true;
+    }
+
+    static void Keep(FloorplanData& plan, FloorplanConstraints changed) {
+        plan.constraints = std::move(changed);
+        plan.modified = true;
+    }
+
+    static RESULT AnswerBlocks(FloorplanData& plan, FloorplanConstraints changed, const std::vector<std::string>& names,
+                               Out& result, Msg& message) {
+        FloorplanData preview = plan;
+        preview.constraints = changed;
+        Tcl_Obj* answer = nullptr;
+        if (names.size() == 1) {
+            answer = BlockValue(preview, *FindBlock(preview, names.front()));
+        } else {
+            DictBuilder d;
+            for (const std::string& n : names) d.Add(n, BlockValue(preview, *FindBlock(preview, n)));
+            answer = d.Take();
+        }
+        if (!Answer(answer, result, message)) return 0;
+        Keep(plan, std::move(changed));
+        return 1;
+    }
+
+    static Tcl_Obj* BlockProperty(const FloorplanData& plan, const Block& b, const std::string& key) {
+        const auto region = RegionOf(b);
+        if (key == "name") return NewText(b.name);
+        if (key == "cells") return NewList(b.cells);
+        if (key == "size") return NewInt(static_cast<long long>(b.cells.size()));
+        if (key == "region") return NewText(region ? RegionText(*region) : std::string());
+        if (key == "capacity") {
+            const auto capacity = CapacityOf(b, plan);
+            return capacity ? NewInt(*capacity) : NewText("");
+        }
+        if (key == "sites") return NewInt(region ? region->Sites() : 0);
+        DictBuilder d;
+        for (const auto& [k, v] : b.constraints) d.Add(k, v);
+        return d.Take();
+    }
+
+    static Tcl_Obj* BlockValue(const FloorplanData& plan, const Block& b) {
+        DictBuilder d;
+        for (const std::string& key : kBlockProperties)
+            if (key != "name") d.Add(key, BlockProperty(plan, b, key));
+        return d.Take();
+    }
+
+    static Region Clamp(const Region& r, const Device& d) {
+        Region out{std::max(r.x0, 0), std::max(r.y0, 0), std::min(r.x1, d.columns - 1), std::min(r.y1, d.rows - 1)};
+        if (out.x0 > out.x1 || out.y0 > out.y1) return WholeDevice(d);
+        return out;
+    }
+
+    static Tcl_Obj* ViewValue(const FloorplanData& plan, const Region& view) {
+        std::vector<std::string> visible;
+        for (const Block& b : plan.constraints.blocks)
+            if (auto r = RegionOf(b); r && r->Overlaps(view)) visible.push_back(b.name);
+        return DictBuilder()
+            .Add("x0", view.x0)
+            .Add("y0", view.y0)
+            .Add("x1", view.x1)
+            .Add("y1", view.y1)
+            .Add("region", RegionText(view))
+            .Add("blocks", NewList(visible))
+            .Take();
+    }
+
+    static Tcl_Obj* Property(const ToolState& state, const FloorplanData& plan, const std::string& key) {
+        const Device& d = plan.device;
+        if (key == "name") return NewText(plan.name);
+        if (key == "design") {
+            const Design* design = state.CurrentDesign();
+            return NewText(design ? design->name : std::string());
+        }
+        if (key == "device") return NewText(d.name);
+        if (key == "columns") return NewInt(d.columns);
+        if (key == "rows") return NewInt(d.rows);
+        if (key == "site_capacity") return NewInt(d.siteCapacity);
+        if (key == "banks") {
+            std::vector<std::string> names;
+            for (const Bank& b : d.banks) names.push_back(b.name);
+            return NewList(names);
+        }
+        if (key == "sso_limit") {
+            DictBuilder limits;
+            for (const Bank& b : d.banks) limits.Add(b.name, b.ssoLimit);
+            return limits.Take();
+        }
+        if (key == "clock_limit") return NewInt(plan.clockLimit);
+        if (key == "blocks") return NewList(BlockList(plan.constraints));
+        if (key == "prohibited") return NewList(SiteOrder(plan.constraints.prohibited));
+        if (key == "modified") return NewBool(plan.modified);
+        return ViewValue(plan, plan.view);
+    }
+
+    RESULT SwitchSites(const Prop& sites, bool prohibit, Out& result, Msg& message) {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        FloorplanData* plan = Ready(*state, message);
+        if (!plan) return 0;
+        std::vector<std::string> words;
+        if (!WordsOf(sites, words)) return Fail(message, "the sites are no proper list");
+        if (words.empty()) return Fail(message, "no site given");
+        std::set<std::string> changed = plan->constraints.prohibited;
+        for (const std::string& w : words) {
+            Region r;
+            std::string error;
+            const bool range = w.find(':') != std::string::npos;
+            int x = 0, y = 0;
+            if (range ? !ParseRegion(w, r, error) : !ParseSiteName(w, x, y))
+                return Fail(message, Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
+            if (!range) r = Region{x, y, x, y};
+            if (!plan->device.OnDevice(r.x0, r.y0) || !plan->device.OnDevice(r.x1, r.y1))
+                return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan->device.columns) + " x " +
+                                         std::to_string(plan->device.rows) + " sites)");
+            for (int yy = r.y0; yy <= r.y1; ++yy)
+                for (int xx = r.x0; xx <= r.x1; ++xx) {
+                    if (prohibit) changed.insert(Device::SiteName(xx, yy));
+                    else changed.erase(Device::SiteName(xx, yy));
+                }
+        }
+        if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
+        plan->constraints.prohibited = std::move(changed);
+        plan->modified = true;
+        return 1;
+    }
+
+    std::weak_ptr<ToolState> m_state;  // the interpreter owns the state; this object may outlive it
+};
+
+}  // namespace
+
+TcltaskI::IXFloorplan* NewFloorplan(const StatePtr& state) { return new Floorplan(state); }
+
+}  // namespace kelmartool
