@@ -53,6 +53,9 @@ Tcl_Obj* NewList(std::initializer_list<Tcl_Obj*> items);  // takes the items as 
 class DictBuilder {
 public:
     DictBuilder();
+    ~DictBuilder();
+    DictBuilder(const DictBuilder&) = delete;
+    DictBuilder& operator=(const DictBuilder&) = delete;
     DictBuilder& Add(std::string_view key, Tcl_Obj* value);
     DictBuilder& Add(std::string_view key, std::string_view text) { return Add(key, NewText(text)); }
     DictBuilder& Add(std::string_view key, const char* text) { return Add(key, NewText(text)); }
@@ -65,7 +68,7 @@ public:
     Tcl_Obj* Take() noexcept;  // the dict, without a reference; the builder is empty afterwards
 
 private:
-    TclValue m_dict;
+    Tcl_Obj* m_dict;  // no references while it is built: it stays unshared
 };
 
 // A new property component holding `value` (which may have no references yet). Null, with

@@ -1,0 +1,397 @@
+// The design model: name index, checks and lookups; typed settings; the tool state.
+#include "design.h"
+
+#include <algorithm>
+#include <array>
+#include <cctype>
+#include <charconv>
+#include <cmath>
+#include <cstdio>
+
+#include "property.h"
+
+namespace kelmartool {
+
+namespace {
+
+constexpr std::array<const char*, 6> kKindWords{"cell", "net", "port", "clock", "bank", "site"};
+
+std::string Num(double value) {
+    TclValue v(NewDouble(value));
+    return v.Text();
+}
+
+}  // namespace
+
+const char* KindWord(Kind kind) noexcept { return kKindWords[static_cast<std::size_t>(kind)]; }
+
+std::optional<Kind> KindFromWord(std::string_view word) noexcept {
+    for (std::size_t i = 0; i < kKindWords.size(); ++i)
+        if (word == kKindWords[i]) return static_cast<Kind>(i);
+    return std::nullopt;
+}
+
+// ---------------------------------------------------------------------------------------------
+
+std::string Device::SiteName(int x, int y) { return "X" + std::to_string(x) + "Y" + std::to_string(y); }
+
+std::optional<SiteRef> Device::ParseSite(std::string_view name) const {
+    if (name.size() < 4 || name[0] != 'X') return std::nullopt;
+    const auto ypos = name.find('Y');
+    if (ypos == std::string_view::npos || ypos < 2 || ypos + 1 >= name.size()) return std::nullopt;
+    auto number = [](std::string_view digits, int& out) {
+        if (digits.empty() || digits.size() > 6) return false;
+        for (char c : digits)
+            if (!std::isdigit(static_cast<unsigned char>(c))) return false;
+        if (digits.size() > 1 && digits[0] == '0') return false;  // one spelling per site
+        std::from_chars(digits.data(), digits.data() + digits.size(), out);
+        return true;
+    };
+    SiteRef site;
+    if (!number(name.substr(1, ypos - 1), site.x) || !number(name.substr(ypos + 1), site.y)) return std::nullopt;
+    if (!OnDevice(site.x, site.y)) return std::nullopt;
+    return site;
+}
+
+const Bank* Device::BankOf(int x, int y) const noexcept {
+    for (const Bank& bank : banks)
+        if (bank.Contains(x, y)) return &bank;
+    return nullptr;
+}
+
+// ---------------------------------------------------------------------------------------------
+
+std::string Design::Index() {
+    m_index.clear();
+    if (device.columns <= 0 || device.rows <= 0) return "the device needs at least one column and one row";
+    if (device.siteCapacity <= 0) return "the site capacity of the device must be positive";
+    auto add = [this](const std::string& objectName, Kind kind, std::size_t index) -> std::string {
+        if (objectName.empty()) return std::string("a ") + KindWord(kind) + " has no name";
+        if (device.ParseSite(objectName)) return "the name '" + objectName + "' is taken by a site";
+        auto [it, fresh] = m_index.emplace(objectName, ObjectRef{kind, index});
+        if (!fresh)
+            return std::string("the name '") + objectName + "' is used twice (" + KindWord(it->second.kind) + " and " +
+                   KindWord(kind) + ")";
+        return {};
+    };
+    std::string problem;
+    for (std::size_t i = 0; i < device.banks.size() && problem.empty(); ++i) {
+        const Bank& b = device.banks[i];
+        problem = add(b.name, Kind::Bank, i);
+        if (problem.empty() && (!device.OnDevice(b.x0, b.y0) || !device.OnDevice(b.x1, b.y1) || b.x0 > b.x1 || b.y0 > b.y1))
+            problem = "bank '" + b.name + "' covers sites outside the device";
+        for (std::size_t j = 0; j < i && problem.empty(); ++j) {
+            const Bank& o = device.banks[j];
+            if (b.x0 <= o.x1 && o.x0 <= b.x1 && b.y0 <= o.y1 && o.y0 <= b.y1)
+                problem = "banks '" + o.name + "' and '" + b.name + "' overlap";
+        }
+    }
+    for (std::size_t i = 0; i < cells.size() && problem.empty(); ++i) problem = add(cells[i].name, Kind::Cell, i);
+    for (std::size_t i = 0; i < nets.size() && problem.empty(); ++i) problem = add(nets[i].name, Kind::Net, i);
+    for (std::size_t i = 0; i < ports.size() && problem.empty(); ++i) problem = add(ports[i].name, Kind::Port, i);
+    for (std::size_t i = 0; i < clocks.size() && problem.empty(); ++i) problem = add(clocks[i].name, Kind::Clock, i);
+    if (!problem.empty()) return problem;
+
+    auto siteOk = [this](const std::string& site) { return site.empty() || device.ParseSite(site).has_value(); };
+    for (const Cell& c : cells) {
+        if (!siteOk(c.site)) return "cell '" + c.name + "' is placed on '" + c.site + "', which is no site of the device";
+        if (c.delay < 0 || c.setup < 0) return "cell '" + c.name + "' has a negative delay";
+        if (c.sequential && !c.clock.empty() && !FindClock(c.clock))
+            return "cell '" + c.name + "' names the unknown clock '" + c.clock + "'";
+    }
+    for (const IoPort& p : ports)
+        if (!siteOk(p.site)) return "port '" + p.name + "' is placed on '" + p.site + "', which is no site of the device";
+    for (const Net& n : nets) {
+        if (n.delay < 0) return "net '" + n.name + "' has a negative delay";
+        const auto driver = Find(n.driver);
+        if (!driver || (driver->kind != Kind::Cell && driver->kind != Kind::Port))
+            return "net '" + n.name + "' has the unknown driver '" + n.driver + "'";
+        if (driver->kind == Kind::Port && ports[driver->index].output)
+            return "net '" + n.name + "' is driven by the output port '" + n.driver + "'";
+        for (const std::string& load : n.loads) {
+            const auto ref = Find(load);
+            if (!ref || (ref->kind != Kind::Cell && ref->kind != Kind::Port))
+                return "net '" + n.name + "' has the unknown load '" + load + "'";
+            if (ref->kind == Kind::Port && !ports[ref->index].output)
+                return "net '" + n.name + "' loads the input port '" + load + "'";
+        }
+    }
+    for (const Clock& c : clocks) {
+        if (!(c.period > 0)) return "clock '" + c.name + "' needs a positive period";
+        if (!c.net.empty() && !FindNet(c.net)) return "clock '" + c.name + "' drives the unknown net '" + c.net + "'";
+    }
+    std::set<std::string> blockNames;
+    for (const Block& b : blocks) {
+        if (b.name.empty() || !blockNames.insert(b.name).second) return "block names must be present and unique";
+        for (const std::string& cell : b.cells)
+            if (!FindCell(cell)) return "block '" + b.name + "' holds the unknown cell '" + cell + "'";
+    }
+    for (const std::string& site : prohibited)
+        if (!device.ParseSite(site)) return "the prohibited site '" + site + "' is no site of the device";
+    return {};
+}
+
+std::optional<ObjectRef> Design::Find(std::string_view objectName) const {
+    if (auto it = m_index.find(objectName); it != m_index.end()) return it->second;
+    if (auto site = device.ParseSite(objectName))
+        return ObjectRef{Kind::Site, static_cast<std::size_t>(site->x + site->y * device.columns)};
+    return std::nullopt;
+}
+
+namespace {
+template <class T>
+T* Pick(std::vector<T>& items, const std::optional<ObjectRef>& ref, Kind kind) {
+    return ref && ref->kind == kind ? &items[ref->index] : nullptr;
+}
+}  // namespace
+
+const Cell* Design::FindCell(std::string_view n) const { return const_cast<Design*>(this)->FindCell(n); }
+const Net* Design::FindNet(std::string_view n) const { return const_cast<Design*>(this)->FindNet(n); }
+const IoPort* Design::FindPort(std::string_view n) const { return const_cast<Design*>(this)->FindPort(n); }
+const Clock* Design::FindClock(std::string_view n) const { return const_cast<Design*>(this)->FindClock(n); }
+const Bank* Design::FindBank(std::string_view n) const {
+    const auto ref = Find(n);
+    return ref && ref->kind == Kind::Bank ? &device.banks[ref->index] : nullptr;
+}
+Cell* Design::FindCell(std::string_view n) { return Pick(cells, Find(n), Kind::Cell); }
+Net* Design::FindNet(std::string_view n) { return Pick(nets, Find(n), Kind::Net); }
+IoPort* Design::FindPort(std::string_view n) { return Pick(ports, Find(n), Kind::Port); }
+Clock* Design::FindClock(std::string_view n) { return Pick(clocks, Find(n), Kind::Clock); }
+Block* Design::FindBlock(std::string_view n) {
+    for (Block& b : blocks)
+        if (b.name == n) return &b;
+    return nullptr;
+}
+
+std::vector<std::string> Design::Names(Kind kind) const {
+    std::vector<std::string> out;
+    auto collect = [&out](const auto& items) {
+        out.reserve(items.size());
+        for (const auto& item : items) out.push_back(item.name);
+    };
+    switch (kind) {
+        case Kind::Cell: collect(cells); break;
+        case Kind::Net: collect(nets); break;
+        case Kind::Port: collect(ports); break;
+        case Kind::Clock: collect(clocks); break;
+        case Kind::Bank: collect(device.banks); break;
+        case Kind::Site:
+            out.reserve(static_cast<std::size_t>(device.columns) * static_cast<std::size_t>(device.rows));
+            for (int y = 0; y < device.rows; ++y)
+                for (int x = 0; x < device.columns; ++x) out.push_back(Device::SiteName(x, y));
+            break;
+    }
+    return out;
+}
+
+std::string Design::TypeOf(std::string_view objectName) const {
+    const auto ref = Find(objectName);
+    return ref ? KindWord(ref->kind) : "";
+}
+
+std::optional<Properties> Design::PropertiesOf(std::string_view objectName) const {
+    const auto ref = Find(objectName);
+    if (!ref) return std::nullopt;
+    Properties p;
+    auto join = [](const std::vector<std::string>& words) {
+        TclValue list(NewList(words));
+        return list.Text();
+    };
+    switch (ref->kind) {
+        case Kind::Cell: {
+            const Cell& c = cells[ref->index];
+            p = c.properties;
+            p["cell_type"] = c.type;
+            p["site"] = c.site;
+            p["delay"] = Num(c.delay);
+            p["sequential"] = c.sequential ? "1" : "0";
+            if (c.sequential) {
+                p["setup"] = Num(c.setup);
+                p["clock"] = c.clock;
+            }
+            std::vector<std::string> in, out;
+            for (const Net& n : nets) {
+                if (n.driver == c.name) out.push_back(n.name);
+                if (std::find(n.loads.begin(), n.loads.end(), c.name) != n.loads.end()) in.push_back(n.name);
+            }
+            p["input_nets"] = join(in);
+            p["output_nets"] = join(out);
+            break;
+        }
+        case Kind::Net: {
+            const Net& n = nets[ref->index];
+            p = n.properties;
+            p["driver"] = n.driver;
+            p["loads"] = join(n.loads);
+            p["fanout"] = std::to_string(n.loads.size());
+            p["delay"] = Num(n.delay);
+            break;
+        }
+        case Kind::Port: {
+            const IoPort& port = ports[ref->index];
+            p = port.properties;
+            p["direction"] = port.output ? "out" : "in";
+            p["site"] = port.site;
+            p["standard"] = port.standard;
+            std::string bank;
+            if (auto s = device.ParseSite(port.site))
+                if (const Bank* b = device.BankOf(s->x, s->y)) bank = b->name;
+            p["bank"] = bank;
+            break;
+        }
+        case Kind::Clock: {
+            const Clock& c = clocks[ref->index];
+            p = c.properties;
+            p["period"] = Num(c.period);
+            p["frequency_mhz"] = Num(1000.0 / c.period);
+            p["net"] = c.net;
+            break;
+        }
+        case Kind::Bank: {
+            const Bank& b = device.banks[ref->index];
+            p["x0"] = std::to_string(b.x0);
+            p["y0"] = std::to_string(b.y0);
+            p["x1"] = std::to_string(b.x1);
+            p["y1"] = std::to_string(b.y1);
+            p["sso_limit"] = std::to_string(b.ssoLimit);
+            p["sites"] = std::to_string((b.x1 - b.x0 + 1) * (b.y1 - b.y0 + 1));
+            break;
+        }
+        case Kind::Site: {
+            const int x = static_cast<int>(ref->index % static_cast<std::size_t>(device.columns));
+            const int y = static_cast<int>(ref->index / static_cast<std::size_t>(device.columns));
+            const std::string siteName = Device::SiteName(x, y);
+            p["x"] = std::to_string(x);
+            p["y"] = std::to_string(y);
+            const Bank* b = device.BankOf(x, y);
+            p["bank"] = b ? b->name : "";
+            std::vector<std::string> occupants;
+            for (const Cell& c : cells)
+                if (c.site == siteName) occupants.push_back(c.name);
+            for (const IoPort& port : ports)
+                if (port.site == siteName) occupants.push_back(port.name);
+            p["occupants"] = join(occupants);
+            p["prohibited"] = prohibited.count(siteName) ? "1" : "0";
+            break;
+        }
+    }
+    p["name"] = std::string(objectName);
+    p["type"] = KindWord(ref->kind);
+    return p;
+}
+
+// ---------------------------------------------------------------------------------------------
+
+const char* SettingTypeWord(SettingType type) noexcept {
+    switch (type) {
+        case SettingType::Bool: return "bool";
+        case SettingType::Int: return "int";
+        case SettingType::Double: return "double";
+        case SettingType::String: return "string";
+        case SettingType::Color: return "color";
+        case SettingType::Choice: return "choice";
+    }
+    return "string";
+}
+
+namespace {
+
+constexpr std::array<const char*, 16> kColorNames{"black", "white", "red",    "green",  "blue",   "yellow",
+                                                  "cyan",  "magenta", "orange", "purple", "pink", "brown",
+                                                  "gray",  "grey",  "lime",   "navy"};
+
+// The canonical text of `text` read as `type`, or nothing.
+std::optional<std::string> Canonical(const Setting& s, const std::string& text) {
+    TclValue value(NewText(text));
+    switch (s.type) {
+        case SettingType::Bool: {
+            int b = 0;
+            if (Tcl_GetBooleanFromObj(nullptr, value.get(), &b) != TCL_OK) return std::nullopt;
+            return b ? "1" : "0";
+        }
+        case SettingType::Int: {
+            Tcl_WideInt i = 0;
+            if (Tcl_GetWideIntFromObj(nullptr, value.get(), &i) != TCL_OK) return std::nullopt;
+            return std::to_string(i);
+        }
+        case SettingType::Double: {
+            double d = 0;
+            if (Tcl_GetDoubleFromObj(nullptr, value.get(), &d) != TCL_OK || !std::isfinite(d)) return std::nullopt;
+            return Num(d);
+        }
+        case SettingType::Color: return CanonicalColor(text);
+        case SettingType::Choice:
+            if (std::find(s.choices.begin(), s.choices.end(), text) == s.choices.end()) return std::nullopt;
+            return text;
+        case SettingType::String: return text;
+    }
+    return std::nullopt;
+}
+
+}  // namespace
+
+std::optional<std::string> CanonicalColor(std::string_view text) {
+    std::string lower(text);
+    for (char& c : lower) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    if (lower.size() == 7 && lower[0] == '#' &&
+        std::all_of(lower.begin() + 1, lower.end(), [](char c) { return std::isxdigit(static_cast<unsigned char>(c)); }))
+        return lower;
+    for (const char* name : kColorNames)
+        if (lower == name) return lower;
+    return std::nullopt;
+}
+
+void SettingTable::Define(const std::string& settingName, SettingType type, const std::string& value,
+                          const std::string& description, std::vector<std::string> choices) {
+    Setting s;
+    s.type = type;
+    s.value = value;
+    s.defaultValue = value;
+    s.description = description;
+    s.choices = std::move(choices);
+    s.builtIn = true;
+    m_settings[settingName] = std::move(s);
+}
+
+std::string SettingTable::Set(const std::string& settingName, const std::string& text, bool allowNew) {
+    auto it = m_settings.find(settingName);
+    if (it == m_settings.end()) {
+        if (!allowNew) return "unknown setting '" + settingName + "'";
+        if (settingName.empty()) return "a setting needs a name";
+        Setting s;
+        s.value = text;
+        s.description = "set by a script";
+        m_settings.emplace(settingName, std::move(s));
+        return {};
+    }
+    Setting& s = it->second;
+    auto value = Canonical(s, text);
+    if (!value) {
+        std::string expected = std::string("a value of type ") + SettingTypeWord(s.type);
+        if (s.type == SettingType::Color) expected = "a colour name or #rrggbb";
+        if (s.type == SettingType::Choice) {
+            TclValue list(NewList(s.choices));
+            expected = "one of: " + list.Text();
+        }
+        return "bad value '" + text + "' for setting '" + settingName + "': expected " + expected;
+    }
+    s.value = *value;
+    return {};
+}
+
+std::string SettingTable::Unset(const std::string& settingName) {
+    auto it = m_settings.find(settingName);
+    if (it == m_settings.end()) return "unknown setting '" + settingName + "'";
+    if (it->second.builtIn)
+        it->second.value = it->second.defaultValue;
+    else
+        m_settings.erase(it);
+    return {};
+}
+
+const Setting* SettingTable::Find(const std::string& settingName) const {
+    auto it = m_settings.find(settingName);
+    return it == m_settings.end() ? nullptr : &it->second;
+}
+
+}  // namespace kelmartool

@@ -1,0 +1,342 @@
+// Reading and writing a design as JSON. The file:
+//
+//   { "design": NAME,
+//     "device": { "name": N, "columns": C, "rows": R, "site_capacity": 1,
+//                 "banks": [ { "name": B, "sites": "X0Y0:X3Y7", "sso_limit": 8 } ] },
+//     "clocks": [ { "name": N, "period": 10.0, "net": NET } ],
+//     "ports":  [ { "name": N, "direction": "in"|"out", "site": "X0Y3", "standard": "LVCMOS33" } ],
+//     "cells":  [ { "name": N, "type": "LUT", "site": "X1Y1", "delay": 0.4,
+//                   "sequential": false, "setup": 0.1, "clock": CLOCK } ],
+//     "nets":   [ { "name": N, "driver": CELL_OR_PORT, "loads": [ ... ], "delay": 0.2 } ],
+//     "floorplan": { "blocks": [ { "name": B, "cells": [ ... ], "region": "X0Y0:X3Y3",
+//                                  "constraints": { ... } } ],
+//                    "prohibited": [ "X2Y2" ] },
+//     "properties": { ... } }
+//
+// Every object may carry "properties", an object of strings. Only "design" and "device" are
+// required; "sequential" defaults to true for the type FF.
+#include <fstream>
+#include <sstream>
+
+#include <nlohmann/json.hpp>
+
+#include "design.h"
+
+namespace kelmartool {
+
+namespace {
+
+using nlohmann::ordered_json;
+
+// A field that is not what it should be; the text names the field by its path.
+struct BadField {
+    std::string text;
+};
+
+class Reader {
+public:
+    explicit Reader(const ordered_json& node, std::string path) : m_node(node), m_path(std::move(path)) {}
+
+    bool Has(const char* key) const { return m_node.contains(key) && !m_node.at(key).is_null(); }
+
+    std::string Text(const char* key, bool required = false, const std::string& fallback = {}) const {
+        if (!Has(key)) return Missing(key, required, fallback);
+        const auto& v = m_node.at(key);
+        if (!v.is_string()) throw BadField{Path(key) + " must be a string"};
+        return v.get<std::string>();
+    }
+    double Number(const char* key, double fallback = 0) const {
+        if (!Has(key)) return fallback;
+        const auto& v = m_node.at(key);
+        if (!v.is_number()) throw BadField{Path(key) + " must be a number"};
+        return v.get<double>();
+    }
+    int Integer(const char* key, bool required = false, int fallback = 0) const {
+        if (!Has(key)) {
+            if (required) throw BadField{Path(key) + " is missing"};
+            return fallback;
+        }
+        const auto& v = m_node.at(key);
+        if (!v.is_number_integer()) throw BadField{Path(key) + " must be an integer"};
+        return v.get<int>();
+    }
+    bool Flag(const char* key, bool fallback) const {
+        if (!Has(key)) return fallback;
+        const auto& v = m_node.at(key);
+        if (!v.is_boolean()) throw BadField{Path(key) + " must be true or false"};
+        return v.get<bool>();
+    }
+    std::vector<std::string> Words(const char* key) const {
+        std::vector<std::string> out;
+        if (!Has(key)) return out;
+        const auto& v = m_node.at(key);
+        if (!v.is_array()) throw BadField{Path(key) + " must be a list of names"};
+        for (std::size_t i = 0; i < v.size(); ++i) {
+            if (!v[i].is_string()) throw BadField{Path(key) + "[" + std::to_string(i) + "] must be a string"};
+            out.push_back(v[i].get<std::string>());
+        }
+        return out;
+    }
+    Properties Props(const char* key = "properties") const {
+        Properties out;
+        if (!Has(key)) return out;
+        const auto& v = m_node.at(key);
+        if (!v.is_object()) throw BadField{Path(key) + " must be an object"};
+        for (const auto& [k, value] : v.items()) {
+            if (value.is_string())
+                out[k] = value.get<std::string>();
+            else if (value.is_primitive())
+                out[k] = value.dump();
+            else
+                throw BadField{Path(key) + "." + k + " must be a plain value"};
+        }
+        return out;
+    }
+    // The elements of a list of objects, each with its path.
+    std::vector<Reader> Items(const char* key) const {
+        std::vector<Reader> out;
+        if (!Has(key)) return out;
+        const auto& v = m_node.at(key);
+        if (!v.is_array()) throw BadField{Path(key) + " must be a list"};
+        for (std::size_t i = 0; i < v.size(); ++i) {
+            std::string path = Path(key) + "[" + std::to_string(i) + "]";
+            if (!v[i].is_object()) throw BadField{path + " must be an object"};
+            out.emplace_back(v[i], std::move(path));
+        }
+        return out;
+    }
+    Reader Child(const char* key, bool required) const {
+        static const ordered_json empty = ordered_json::object();
+        if (!Has(key)) {
+            if (required) throw BadField{Path(key) + " is missing"};
+            return Reader(empty, Path(key));
+        }
+        const auto& v = m_node.at(key);
+        if (!v.is_object()) throw BadField{Path(key) + " must be an object"};
+        return Reader(v, Path(key));
+    }
+    std::string Path(const char* key) const { return m_path.empty() ? key : m_path + "." + key; }
+
+private:
+    std::string Missing(const char* key, bool required, const std::string& fallback) const {
+        if (required) throw BadField{Path(key) + " is missing"};
+        return fallback;
+    }
+
+    const ordered_json& m_node;
+    std::string m_path;
+};
+
+// "X0Y0:X3Y7" on a device of the given size.
+void ParseRange(const Device& device, const std::string& text, const std::string& path, int& x0, int& y0, int& x1,
+                int& y1) {
+    const auto colon = text.find(':');
+    auto a = device.ParseSite(text.substr(0, colon));
+    auto b = colon == std::string::npos ? a : device.ParseSite(text.substr(colon + 1));
+    if (!a || !b) throw BadField{path + " must be a range of sites of the device like X0Y0:X3Y3, not '" + text + "'"};
+    x0 = std::min(a->x, b->x);
+    y0 = std::min(a->y, b->y);
+    x1 = std::max(a->x, b->x);
+    y1 = std::max(a->y, b->y);
+}
+
+std::string RangeText(int x0, int y0, int x1, int y1) {
+    return Device::SiteName(x0, y0) + ":" + Device::SiteName(x1, y1);
+}
+
+std::unique_ptr<Design> Build(const ordered_json& root) {
+    if (!root.is_object()) throw BadField{"the top level must be an object"};
+    Reader top(root, "");
+    auto design = std::make_unique<Design>();
+    design->name = top.Text("design", true);
+    design->properties = top.Props();
+
+    Reader dev = top.Child("device", true);
+    Device& device = design->device;
+    device.name = dev.Text("name", false, "device");
+    device.columns = dev.Integer("columns", true);
+    device.rows = dev.Integer("rows", true);
+    device.siteCapacity = dev.Integer("site_capacity", false, 1);
+    if (device.columns <= 0 || device.rows <= 0 || device.columns > 100000 || device.rows > 100000)
+        throw BadField{"device.columns and device.rows must lie between 1 and 100000"};
+    for (const Reader& r : dev.Items("banks")) {
+        Bank b;
+        b.name = r.Text("name", true);
+        ParseRange(device, r.Text("sites", true), r.Path("sites"), b.x0, b.y0, b.x1, b.y1);
+        b.ssoLimit = r.Integer("sso_limit", false, 0);
+        device.banks.push_back(std::move(b));
+    }
+    for (const Reader& r : top.Items("clocks")) {
+        Clock c;
+        c.name = r.Text("name", true);
+        c.period = r.Number("period");
+        c.net = r.Text("net");
+        c.properties = r.Props();
+        design->clocks.push_back(std::move(c));
+    }
+    for (const Reader& r : top.Items("ports")) {
+        IoPort p;
+        p.name = r.Text("name", true);
+        const std::string direction = r.Text("direction", true);
+        if (direction != "in" && direction != "out") throw BadField{r.Path("direction") + " must be in or out"};
+        p.output = direction == "out";
+        p.site = r.Text("site");
+        p.standard = r.Text("standard");
+        p.properties = r.Props();
+        design->ports.push_back(std::move(p));
+    }
+    for (const Reader& r : top.Items("cells")) {
+        Cell c;
+        c.name = r.Text("name", true);
+        c.type = r.Text("type", true);
+        c.site = r.Text("site");
+        c.delay = r.Number("delay");
+        c.setup = r.Number("setup");
+        c.sequential = r.Flag("sequential", c.type == "FF");
+        c.clock = r.Text("clock");
+        c.properties = r.Props();
+        design->cells.push_back(std::move(c));
+    }
+    for (const Reader& r : top.Items("nets")) {
+        Net n;
+        n.name = r.Text("name", true);
+        n.driver = r.Text("driver", true);
+        n.loads = r.Words("loads");
+        n.delay = r.Number("delay");
+        n.properties = r.Props();
+        design->nets.push_back(std::move(n));
+    }
+    Reader plan = top.Child("floorplan", false);
+    for (const Reader& r : plan.Items("blocks")) {
+        Block b;
+        b.name = r.Text("name", true);
+        b.cells = r.Words("cells");
+        if (r.Has("region")) {
+            int x0, y0, x1, y1;
+            ParseRange(device, r.Text("region"), r.Path("region"), x0, y0, x1, y1);
+            b.x0 = x0, b.y0 = y0, b.x1 = x1, b.y1 = y1;
+        }
+        b.constraints = r.Props("constraints");
+        design->blocks.push_back(std::move(b));
+    }
+    for (std::string& site : plan.Words("prohibited")) design->prohibited.insert(std::move(site));
+
+    if (std::string problem = design->Index(); !problem.empty()) throw BadField{problem};
+    return design;
+}
+
+ordered_json PropsJson(const Properties& p) {
+    ordered_json out = ordered_json::object();
+    for (const auto& [k, v] : p) out[k] = v;
+    return out;
+}
+
+}  // namespace
+
+std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error) {
+    ordered_json root;
+    try {
+        root = ordered_json::parse(text);
+    } catch (const nlohmann::json::parse_error& e) {
+        error = std::string("it is not valid JSON (") + e.what() + ")";
+        return nullptr;
+    }
+    try {
+        return Build(root);
+    } catch (const BadField& bad) {
+        error = bad.text;
+    } catch (const nlohmann::json::exception& e) {
+        error = e.what();
+    }
+    return nullptr;
+}
+
+std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error) {
+    std::ifstream in(file, std::ios::binary);
+    if (!in) {
+        error = "cannot read the project file '" + file + "': no such readable file";
+        return nullptr;
+    }
+    std::ostringstream text;
+    text << in.rdbuf();
+    std::string problem;
+    auto design = ParseDesign(text.str(), problem);
+    if (!design) error = "the project file '" + file + "' is malformed: " + problem;
+    return design;
+}
+
+std::string FormatDesign(const Design& d) {
+    ordered_json root = ordered_json::object();
+    root["design"] = d.name;
+    ordered_json device = ordered_json::object();
+    device["name"] = d.device.name;
+    device["columns"] = d.device.columns;
+    device["rows"] = d.device.rows;
+    device["site_capacity"] = d.device.siteCapacity;
+    device["banks"] = ordered_json::array();
+    for (const Bank& b : d.device.banks)
+        device["banks"].push_back({{"name", b.name}, {"sites", RangeText(b.x0, b.y0, b.x1, b.y1)}, {"sso_limit", b.ssoLimit}});
+    root["device"] = std::move(device);
+    auto withProps = [](ordered_json obj, const Properties& p) {
+        if (!p.empty()) obj["properties"] = PropsJson(p);
+        return obj;
+    };
+    root["clocks"] = ordered_json::array();
+    for (const Clock& c : d.clocks)
+        root["clocks"].push_back(withProps({{"name", c.name}, {"period", c.period}, {"net", c.net}}, c.properties));
+    root["ports"] = ordered_json::array();
+    for (const IoPort& p : d.ports)
+        root["ports"].push_back(withProps(
+            {{"name", p.name}, {"direction", p.output ? "out" : "in"}, {"site", p.site}, {"standard", p.standard}},
+            p.properties));
+    root["cells"] = ordered_json::array();
+    for (const Cell& c : d.cells) {
+        ordered_json cell = {{"name", c.name}, {"type", c.type}, {"site", c.site}, {"delay", c.delay}};
+        if (c.sequential != (c.type == "FF")) cell["sequential"] = c.sequential;
+        if (c.sequential) {
+            cell["setup"] = c.setup;
+            cell["clock"] = c.clock;
+        }
+        root["cells"].push_back(withProps(std::move(cell), c.properties));
+    }
+    root["nets"] = ordered_json::array();
+    for (const Net& n : d.nets)
+        root["nets"].push_back(
+            withProps({{"name", n.name}, {"driver", n.driver}, {"loads", n.loads}, {"delay", n.delay}}, n.properties));
+    if (!d.blocks.empty() || !d.prohibited.empty()) {
+        ordered_json plan = ordered_json::object();
+        plan["blocks"] = ordered_json::array();
+        for (const Block& b : d.blocks) {
+            ordered_json block = {{"name", b.name}, {"cells", b.cells}};
+            if (b.x0 && b.y0 && b.x1 && b.y1) block["region"] = RangeText(*b.x0, *b.y0, *b.x1, *b.y1);
+            if (!b.constraints.empty()) block["constraints"] = PropsJson(b.constraints);
+            plan["blocks"].push_back(std::move(block));
+        }
+        plan["prohibited"] = ordered_json::array();
+        for (const std::string& s : d.prohibited) plan["prohibited"].push_back(s);
+        root["floorplan"] = std::move(plan);
+    }
+    if (!d.properties.empty()) root["properties"] = PropsJson(d.properties);
+    return root.dump(2) + "\n";
+}
+
+bool WriteDesign(const Design& design, const std::string& file, std::string& error) {
+    // Written beside the file first, so that a failed write leaves the old file whole.
+    const std::string temporary = file + ".tmp";
+    {
+        std::ofstream out(temporary, std::ios::binary | std::ios::trunc);
+        if (!out || !(out << FormatDesign(design)) || !out.flush()) {
+            error = "cannot write the project file '" + file + "'";
+            std::remove(temporary.c_str());
+            return false;
+        }
+    }
+    if (std::rename(temporary.c_str(), file.c_str()) != 0) {
+        error = "cannot replace the project file '" + file + "'";
+        std::remove(temporary.c_str());
+        return false;
+    }
+    return true;
+}
+
+}  // namespace kelmartool

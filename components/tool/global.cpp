@@ -1,0 +1,63 @@
+// Global settings: typed values that a script can set, read, restore and list.
+#include "TcltaskI/IGlobal.h"
+#include "component.h"
+#include "property.h"
+#include "roots.h"
+
+namespace kelmartool {
+
+Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors) {
+    if (!descriptors) {
+        DictBuilder dict;
+        for (const auto& [name, setting] : table.All()) dict.Add(name, setting.value);
+        return dict.Take();
+    }
+    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+    for (const auto& [name, setting] : table.All()) {
+        DictBuilder d;
+        d.Add("name", name).Add("type", SettingTypeWord(setting.type)).Add("description", setting.description);
+        d.Add("value", setting.value);
+        if (!setting.choices.empty()) d.Add("choices", NewList(setting.choices));
+        Tcl_ListObjAppendElement(nullptr, list, d.Take());
+    }
+    return list;
+}
+
+namespace {
+
+class Global final : public Component<TcltaskI::IGlobal> {
+public:
+    explicit Global(const StatePtr& state) : m_state(state) {}
+
+    CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
+        if (std::string error = m_state->settings.Set(name.c_str(), TextOf(value), true); !error.empty())
+            return Fail(message, error);
+        return Answer(NewText(m_state->settings.Find(name.c_str())->value), result, message);
+    }
+
+    CommonI::RESULT unset(const Str& name, Out& result, Msg& message) override {
+        if (std::string error = m_state->settings.Unset(name.c_str()); !error.empty()) return Fail(message, error);
+        const Setting* restored = m_state->settings.Find(name.c_str());
+        if (restored == nullptr) return 1;  // a script's own setting is gone
+        return Answer(NewText(restored->value), result, message);
+    }
+
+    CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
+        const Setting* setting = m_state->settings.Find(name.c_str());
+        if (setting == nullptr) return Fail(message, std::string("unknown setting '") + name.c_str() + "'");
+        return Answer(NewText(setting->value), result, message);
+    }
+
+    CommonI::RESULT properties(Out& result, Msg& message) override {
+        return Answer(SettingsValue(m_state->settings, false), result, message);
+    }
+
+private:
+    StatePtr m_state;
+};
+
+}  // namespace
+
+CitI::IInterface* NewGlobal(const StatePtr& state) { return static_cast<TcltaskI::IGlobal*>(new Global(state)); }
+
+}  // namespace kelmartool

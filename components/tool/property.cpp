@@ -1,0 +1,124 @@
+// Tcl values in and out of the tool, through the property component of the support library.
+#include "property.h"
+
+#include <cmath>
+#include <cstdio>
+#include <string>
+#include <utility>
+
+#include "CitP/Factory.h"
+
+namespace kelmartool {
+
+std::string TclValue::Text() const {
+    if (m_obj == nullptr) return {};
+    int length = 0;
+    const char* text = Tcl_GetStringFromObj(m_obj, &length);
+    return std::string(text, static_cast<std::size_t>(length));
+}
+
+Tcl_Obj* NewText(std::string_view text) { return Tcl_NewStringObj(text.data(), static_cast<int>(text.size())); }
+
+Tcl_Obj* NewInt(long long value) { return Tcl_NewWideIntObj(static_cast<Tcl_WideInt>(value)); }
+
+Tcl_Obj* NewDouble(double value) {
+    // Whole numbers read as integers; others with the fewest digits that read back the same.
+    if (std::isfinite(value) && value == std::round(value) && std::fabs(value) < 1e15)
+        return NewInt(static_cast<long long>(std::llround(value)));
+    char buffer[40];
+    for (int digits = 1; digits <= 17; ++digits) {
+        std::snprintf(buffer, sizeof buffer, "%.*g", digits, value);
+        if (std::strtod(buffer, nullptr) == value) break;
+    }
+    return Tcl_NewStringObj(buffer, -1);
+}
+
+Tcl_Obj* NewBool(bool value) { return Tcl_NewIntObj(value ? 1 : 0); }
+
+Tcl_Obj* NewList(const std::vector<std::string>& words) {
+    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+    for (const std::string& w : words) Tcl_ListObjAppendElement(nullptr, list, NewText(w));
+    return list;
+}
+
+Tcl_Obj* NewList(std::initializer_list<Tcl_Obj*> items) {
+    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+    for (Tcl_Obj* item : items) Tcl_ListObjAppendElement(nullptr, list, item);
+    return list;
+}
+
+DictBuilder::DictBuilder() : m_dict(Tcl_NewListObj(0, nullptr)) {}
+
+DictBuilder::~DictBuilder() {
+    if (m_dict != nullptr) {
+        Tcl_IncrRefCount(m_dict);
+        Tcl_DecrRefCount(m_dict);
+    }
+}
+
+// A dict's text is the list of its pairs; building it as a list keeps the order of the calls and
+// stays a proper dict as long as keys are not repeated.
+DictBuilder& DictBuilder::Add(std::string_view key, Tcl_Obj* value) {
+    Tcl_ListObjAppendElement(nullptr, m_dict, NewText(key));
+    Tcl_ListObjAppendElement(nullptr, m_dict, value);
+    return *this;
+}
+
+Tcl_Obj* DictBuilder::Take() noexcept { return std::exchange(m_dict, Tcl_NewListObj(0, nullptr)); }
+
+UtilI::MITclProperty MakeProperty(Tcl_Obj* value, Port_String& message) {
+    TclValue hold(value);  // frees a value without references on every way out
+    if (!CitP::Factory::LoadLibraryFactory("libTcltask_Support")) {
+        message = "the property component library libTcltask_Support cannot be loaded";
+        return {};
+    }
+    CitI::MIInterface component = CitP::Factory::CreateInstanceRef(UtilI::TclPropertyID);
+    UtilI::MITclProperty property(component);
+    if (!property) {
+        message = "the property component cannot be made";
+        return {};
+    }
+    Port_String ignored;
+    property->FromTclObj(value, ignored);
+    return property;
+}
+
+CommonI::RESULT Answer(Tcl_Obj* value, UtilI::MITclProperty& result, Port_String& message) {
+    result = MakeProperty(value, message);
+    return result ? 1 : 0;
+}
+
+CommonI::RESULT Fail(Port_String& message, const std::string& text) {
+    message = text.c_str();
+    return 0;
+}
+
+TclValue ValueOf(const UtilI::MITclProperty& property) {
+    if (!property) return {};
+    Tcl_Obj* out = nullptr;
+    Port_String message;
+    if (property->ToTclObj(out, message) != 1 || out == nullptr) return {};
+    return TclValue(out);
+}
+
+std::string TextOf(const UtilI::MITclProperty& property) { return ValueOf(property).Text(); }
+
+bool WordsOf(const UtilI::MITclProperty& property, std::vector<std::string>& words) {
+    TclValue value = ValueOf(property);
+    if (!value) return true;
+    int count = 0;
+    Tcl_Obj** items = nullptr;
+    if (Tcl_ListObjGetElements(nullptr, value.get(), &count, &items) != TCL_OK) return false;
+    for (int i = 0; i < count; ++i) words.emplace_back(Tcl_GetString(items[i]));
+    return true;
+}
+
+bool WordsOf(const UtilI::TclPropertyList& list, std::vector<std::string>& words) {
+    for (const auto& property : list)
+        if (!WordsOf(property, words)) return false;
+    return true;
+}
+
+bool IsNil(std::string_view text) noexcept { return text == "(nil)" || text == "nil"; }
+
+}  // namespace kelmartool

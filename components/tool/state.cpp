@@ -1,0 +1,91 @@
+// The tool state of one interpreter: its settings and the parts that refer to the current design.
+#include <algorithm>
+
+#include "design.h"
+#include "project.h"
+#include "property.h"
+
+namespace kelmartool {
+
+ToolState::ToolState(Tcl_Interp* owner) : interp(owner) {
+    settings.Define("search_limit", SettingType::Int, "0", "most hits a search gives; 0 gives all");
+    settings.Define("zoom_factor", SettingType::Double, "2", "how much zoom -in and -out magnify or shrink the view");
+    settings.Define("pan_percentage", SettingType::Int, "50", "how far pan moves, in percent of the view, when not given");
+    settings.Define("max_paths", SettingType::Int, "5", "worst paths a timing analysis reports");
+
+    highlightSettings.Define("default_highlight_color", SettingType::Color, "yellow",
+                             "colour of highlight add when no -color is given");
+    highlightSettings.Define("max_items", SettingType::Int, "0", "most objects highlighted at once; 0 is no limit");
+
+    selectionSettings.Define("filter", SettingType::Choice, "all", "the only kind of object that can be selected",
+                             {"all", "cell", "net", "port", "clock", "bank", "site"});
+    selectionSettings.Define("max_items", SettingType::Int, "0", "most objects selected at once; 0 is no limit");
+}
+
+ToolState::~ToolState() = default;
+
+ProjectComponent* ToolState::Current() const noexcept {
+    return projects.empty() ? nullptr : static_cast<ProjectComponent*>(projects.back().get());
+}
+
+Design* ToolState::CurrentDesign() const noexcept {
+    ProjectComponent* current = Current();
+    return current ? current->GetDesign() : nullptr;
+}
+
+void ToolState::DesignChanged() {
+    ++designEpoch;
+    const Design* design = CurrentDesign();
+    auto gone = [design](const std::string& name) { return design == nullptr || !design->Find(name); };
+    std::erase_if(selection, gone);
+    std::erase_if(highlight, [&gone](const auto& entry) { return gone(entry.first); });
+    for (auto& [name, members] : collections) std::erase_if(members, gone);
+    if (design == nullptr) collections.clear();
+    view = ViewState{};
+    if (design != nullptr)
+        view.history.push_back(Viewport{0, 0, static_cast<double>(design->device.columns),
+                                        static_cast<double>(design->device.rows)});
+}
+
+void ToolState::Shutdown() {
+    // Projects may hold registered components that hold this state; let them go first.
+    auto open = std::move(projects);
+    projects.clear();
+    open.clear();
+    timing.reset();
+    floorplan.reset();
+}
+
+bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& names, std::string& error) {
+    const Design* design = state.CurrentDesign();
+    if (design == nullptr) {
+        error = kNoProject;
+        return false;
+    }
+    names.clear();
+    const char* whole = Tcl_GetString(value);
+    if (auto it = state.collections.find(whole); it != state.collections.end()) {
+        names = it->second;
+        return true;
+    }
+    int count = 0;
+    Tcl_Obj** items = nullptr;
+    if (Tcl_ListObjGetElements(nullptr, value, &count, &items) != TCL_OK) {
+        error = std::string("'") + whole + "' is neither a collection nor a list of objects";
+        return false;
+    }
+    for (int i = 0; i < count; ++i) {
+        std::string word = Tcl_GetString(items[i]);
+        if (auto it = state.collections.find(word); it != state.collections.end()) {
+            names.insert(names.end(), it->second.begin(), it->second.end());
+        } else if (design->Find(word)) {
+            names.push_back(std::move(word));
+        } else {
+            error = "unknown object '" + word + "'";
+            return false;
+        }
+    }
+    return true;
+}
+
+}  // namespace kelmartool

@@ -1,0 +1,109 @@
+// Brings the tool up in an interpreter: its state, the root object commands (projmgr, project,
+// collection, settings, obj, view, highlight, selection, search, timing, floorplan) and the
+// convenience command kelmartool::open.
+#include <tcl.h>
+
+#include <string>
+
+#include "CitI/IScriptHandle.h"
+#include "Port/Init.h"
+#include "Script/TclWrapFactory.h"
+#include "TcltaskI/ICollection.h"
+#include "TcltaskI/IGlobal.h"
+#include "TcltaskI/IGraphicalView.h"
+#include "TcltaskI/IHighlight.h"
+#include "TcltaskI/IObject.h"
+#include "TcltaskI/ISearch.h"
+#include "TcltaskI/ISelection.h"
+#include "TcltaskI/ITclProjectMgr.h"
+#include "TcltaskI/ITimingAnalysis.h"
+#include "TcltaskI/IXFloorplan.h"
+#include "project.h"
+#include "roots.h"
+
+namespace {
+
+// This module uses the portability layer, so it holds it up like every other module.
+Port::FileInit s_fileInit;
+Port::PathListInit s_pathListInit;
+CitP::InstanceTableInit s_instanceTableInit;
+CitP::FactoryInit s_factoryInit;
+
+constexpr const char* kStateKey = "kelmartool";
+
+void DeleteState(ClientData data, Tcl_Interp*) {
+    auto* state = static_cast<kelmartool::StatePtr*>(data);
+    (*state)->Shutdown();
+    delete state;
+}
+
+// Hands `object` to Tcl under its interface and makes `root` an alias of the wrapper's word.
+// The wrapper takes its own reference; the one held here goes at the end.
+bool Publish(Tcl_Interp* interp, const char* root, const Port::XUID& id, CitI::IInterface* made) {
+    CitI::MIInterface object(made);
+    CitI::IInterface* wrapped = Script::TclWrapFactory::CreateInstance(id, object.get(), interp);
+    auto* handle = wrapped ? static_cast<CitI::IScriptHandle*>(wrapped->GetInterface(CitI::IScriptHandleID)) : nullptr;
+    if (handle == nullptr || !handle->SetResult(interp)) {
+        Tcl_SetObjResult(interp, Tcl_ObjPrintf("cannot hand the %s object to Tcl: is TcltaskI_Morvane loaded?", root));
+        return false;
+    }
+    Tcl_Obj* word = Tcl_GetObjResult(interp);
+    Tcl_IncrRefCount(word);
+    const bool made_alias = Tcl_CreateAlias(interp, root, interp, Tcl_GetString(word), 0, nullptr) == TCL_OK;
+    Tcl_DecrRefCount(word);
+    Tcl_ResetResult(interp);
+    return made_alias;
+}
+
+// kelmartool::open FILE: opens a design file as the current project; the message on success.
+int OpenCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
+    if (objc != 2) {
+        Tcl_WrongNumArgs(interp, 1, objv, "file");
+        return TCL_ERROR;
+    }
+    kelmartool::StatePtr state = kelmartool::StateOf(interp);
+    CommonI::RefCountPtr<TcltaskI::ITclProjectMgr> manager(static_cast<TcltaskI::ITclProjectMgr*>(
+        kelmartool::NewProjectManager(state)->GetInterface(TcltaskI::ITclProjectMgrID)));
+    Port_String message;
+    const CommonI::RESULT ok = manager->Open(Tcl_GetString(objv[1]), message);
+    Tcl_SetObjResult(interp, Tcl_NewStringObj(message.c_str(), message.Length()));
+    return ok == 1 ? TCL_OK : TCL_ERROR;
+}
+
+}  // namespace
+
+namespace kelmartool {
+
+StatePtr StateOf(Tcl_Interp* interp) {
+    auto* state = static_cast<StatePtr*>(Tcl_GetAssocData(interp, kStateKey, nullptr));
+    return state ? *state : nullptr;
+}
+
+}  // namespace kelmartool
+
+extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp* interp) {
+    if (Tcl_PkgRequire(interp, "TcltaskI_Morvane", "1.0", 0) == nullptr) return TCL_ERROR;
+    if (kelmartool::StateOf(interp)) return TCL_OK;  // already up in this interpreter
+
+    auto* holder = new kelmartool::StatePtr(std::make_shared<kelmartool::ToolState>(interp));
+    Tcl_SetAssocData(interp, kStateKey, DeleteState, holder);
+    const kelmartool::StatePtr& state = *holder;
+
+    using namespace kelmartool;
+    const bool published =
+        Publish(interp, "projmgr", TcltaskI::ITclProjectMgrID, NewProjectManager(state)) &&
+        Publish(interp, "project", TcltaskI::ITclProjectID, NewCurrentProject(state)) &&
+        Publish(interp, "collection", TcltaskI::ICollectionID, NewCollection(state)) &&
+        Publish(interp, "settings", TcltaskI::IGlobalID, NewGlobal(state)) &&
+        Publish(interp, "obj", TcltaskI::IObjectID, NewObjectQuery(state)) &&
+        Publish(interp, "view", TcltaskI::IGraphicalViewID, NewView(state)) &&
+        Publish(interp, "highlight", TcltaskI::IHighlightID, NewHighlight(state)) &&
+        Publish(interp, "selection", TcltaskI::ISelectionID, NewSelection(state)) &&
+        Publish(interp, "search", TcltaskI::ISearchID, NewSearch(state)) &&
+        Publish(interp, "timing", TcltaskI::ITimingAnalysisID, NewTimingAnalysis(state)) &&
+        Publish(interp, "floorplan", TcltaskI::IXFloorplanID, NewFloorplan(state));
+    if (!published) return TCL_ERROR;
+
+    Tcl_CreateObjCommand(interp, "::kelmartool::open", OpenCommand, nullptr, nullptr);
+    return TCL_OK;
+}
