@@ -1,15 +1,16 @@
 # Build, test and run the Tcl binding of the task interfaces.
 #   make build   configure and build into build/ (libraries and pkgIndex.tcl in build/lib)
 #   make test    build and run every test, then again under AddressSanitizer and UBSan
+#   make demo    build and run the tour of the reference tool on the sample design
 #   make clean   remove the build folders
 
 BUILD      ?= build
 SAN_BUILD  ?= build-san
 JOBS       ?= 2
-PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev libgtest-dev
+PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev libgtest-dev nlohmann-json3-dev
 CMAKE_ARGS ?=
 
-.PHONY: deps build test test-plain test-sanitize clean
+.PHONY: deps build test test-plain test-sanitize clean demo
 
 deps:
 	@missing=""; for p in $(PACKAGES); do \
@@ -33,6 +34,9 @@ test-sanitize: deps
 	ctest --test-dir $(SAN_BUILD) --output-on-failure -j $(JOBS)
 
 test: test-plain test-sanitize
+
+demo: build
+	$(BUILD)/bin/kelmarsh -project examples/designs/counter.json examples/tour.tcl
 
 clean:
 	rm -rf $(BUILD) $(SAN_BUILD)
