@@ -2,6 +2,7 @@
 #   make build   configure and build into build/ (libraries and pkgIndex.tcl in build/lib)
 #   make test    build and run every test, then again under AddressSanitizer and UBSan
 #   make demo    build and run the tour of the reference tool on the sample design
+#   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
 #   make clean   remove the build folders
 
 BUILD      ?= build
@@ -37,6 +38,21 @@ test: test-plain test-sanitize
 
 demo: build
 	$(BUILD)/bin/kelmarsh -project examples/designs/counter.json examples/tour.tcl
+
+# The benchmark has its own Release build folder and its own packages: swig makes the
+# generated-binding baseline. The figures land in $(BENCH_BUILD)/bench.json, copied to $(BUILD)/.
+BENCH_BUILD    ?= build-bench
+BENCH_PACKAGES := swig
+
+.PHONY: bench bench-deps
+
+bench-deps: deps
+	@$(MAKE) --no-print-directory deps PACKAGES="$(BENCH_PACKAGES)"
+
+bench: bench-deps
+	cmake -S . -B $(BENCH_BUILD) -DCMAKE_BUILD_TYPE=Release -DKELMAR_BENCH=ON $(CMAKE_ARGS)
+	cmake --build $(BENCH_BUILD) -j $(JOBS) --target run_bench
+	mkdir -p $(BUILD) && cp $(BENCH_BUILD)/bench.json $(BUILD)/bench.json
 
 clean:
 	rm -rf $(BUILD) $(SAN_BUILD)
