@@ -19,11 +19,12 @@ proc infoHolds {outcome} {
 
 # Runs a script in the caller's frame, then deletes the object commands it made, and gives what is
 # still alive beyond what was before, as {kind change ...} for each count of `testkit::live` that
-# moved: empty when the script and its wrappers left nothing behind. Errors of the script are caught.
+# moved: empty when the script and its wrappers left nothing behind. A script that fails gives
+# {error message} besides.
 proc leftAlive {script} {
     set before [testkit::live]
     set words [info commands ::kelmar::*]
-    catch {uplevel 1 $script}
+    set failed [catch {uplevel 1 $script} message]
     foreach word [info commands ::kelmar::*] {
         if {$word ni $words} { rename $word {} }
     }
@@ -32,6 +33,7 @@ proc leftAlive {script} {
         set change [expr {$count - [dict get $before $kind]}]
         if {$change != 0} { lappend moved $kind $change }
     }
+    if {$failed} { lappend moved error $message }
     return $moved
 }
 
@@ -47,3 +49,41 @@ proc kitAnswer {answers op args} {
 
 # The identifier variable of a task interface, e.g. ifaceId ICollection.
 proc ifaceId {iface} { set ::kelmar::TcltaskI::${iface}ID }
+
+# {code result} of a script run in the caller's frame.
+proc ran {script} { lrange [uplevel 1 [list outcome $script]] 0 1 }
+
+# The calls that `$word args...` made of its kit object, after forgetting the earlier ones; when the
+# command fails, {error TEXT} instead.
+proc callsOf {word args} {
+    testkit::reset $word
+    if {[catch {$word {*}$args} text]} { return [list error $text] }
+    testkit::calls $word
+}
+
+# A kit handler by which every operation answers what the global variable `name` holds at the time
+# of the call; the word -error makes the handler fail, so that the kit's operation throws.
+proc answerFrom {name} { list ::kitAnswerFrom $name }
+proc kitAnswerFrom {name op args} {
+    set answer [set ::$name]
+    if {$answer eq "-error"} { error "$op refused by the test" }
+    return $answer
+}
+
+# The package's own texts of the option passes and the frames.
+set wrongCountText "Wrong number of required arguments specified."
+set loaderText "Error loading command argument matcher component library or while creating the command matcher component."
+set ambiguousText "Ambiguous optional argument 'errors\n"
+proc noMatchText {typed args} {
+    set text "Optional argument '$typed' does not match with any of valid optional arguments.\nPlease specify one of the following options\n"
+    foreach name $args { append text "   -$name\n" }
+    return $text
+}
+proc defaultFailureText {name type} {
+    return "\nFailure(s) took place while retrieving the default value for \noptional argument '$name' of type '$type'"
+}
+proc expectsValueText {name type} { return "\nOptional argument '$name' of type '$type' expects a value" }
+proc notASwitchText {word} { return "The current argument \"$word\" is not an optional argument switch as expected." }
+proc unrecognizedText {name} { return "Unrecognized optional argument \"-$name\"" }
+proc noObjectText {class word} { return "Failed to get pointer to wrapped object in TcltaskI::TclWrap${class}::kel_$word" }
+proc exceptionText {class word} { return "An exception took place while calling TcltaskI::TclWrap${class}::kel_$word" }
