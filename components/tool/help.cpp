@@ -133,17 +133,17 @@ constexpr Usage kTiming[] = {
     {"save_as", "timing save_as ANALYSIS FILE: writes the report of an analysis"},
     {"saveas", "timing saveas ANALYSIS FILE: writes the report of an analysis"},
     {"set", "timing set ANALYSIS NAME VALUE: sets a setting of an analysis"},
-    {"set_constraint", "timing set_constraint ANALYSIS NAME VALUE: sets a timing constraint"},
-    {"set_endpoints", "timing set_endpoints ANALYSIS KIND SIDE ENDPOINT...: limits the paths to these end points"},
-    {"set_query", "timing set_query ANALYSIS KIND ITEM... ?-ld N? ?-hf N?: what a run reports"},
-    {"set_filter", "timing set_filter ANALYSIS KIND MODE ITEM...: filters the reported paths"},
+    {"set_constraint", "timing set_constraint ANALYSIS NAME VALUE: sets a constraint: period:CLOCK, input_delay, output_delay, uncertainty, reference_clock"},
+    {"set_endpoints", "timing set_endpoints ANALYSIS from|to only|except ITEM...: limits the paths to these start or end points"},
+    {"set_query", "timing set_query ANALYSIS paths|fanout ITEM... ?-ld N? ?-hf N?: what a run reports"},
+    {"set_filter", "timing set_filter ANALYSIS KIND MODE ITEM...: filters the reported paths by startpoint, endpoint, clock, through or slack"},
     {"show_settings", "timing show_settings ANALYSIS: every setting of an analysis"},
 };
 
 constexpr Usage kFloorplan[] = {
     {"open", "floorplan open: opens the floorplan of the current design"},
-    {"open_full", "floorplan open_full S1 S2 S3: opens the floorplan with every view"},
-    {"open_empty", "floorplan open_empty S1 ... S9: opens an empty floorplan"},
+    {"open_full", "floorplan open_full FILE FORM MODE: opens the floorplan and reads a constraint file of FORM (ucf, csv, vhdl, vlog) into it, MODE replace or merge"},
+    {"open_empty", "floorplan open_empty NAME DEVICE COLUMNS ROWS BANKS LAYOUT SSO_LIMIT SITE_CAPACITY CLOCK_LIMIT: opens an empty floorplan on a new device"},
     {"close", "floorplan close ?-nosave ?BOOL??: closes the floorplan, saving it unless -nosave"},
     {"save", "floorplan save: saves the floorplan into the design"},
     {"import", "floorplan import ?-ucf FILE? ?-csv FILE? ?-vhdl FILE? ?-vlog FILE?: reads constraints"},
@@ -163,8 +163,8 @@ constexpr Usage kFloorplan[] = {
     {"drc", "floorplan drc: overlaps, sites off the device, prohibited sites, over-full regions"},
     {"sso_analysis", "floorplan sso_analysis: outputs per bank against the bank's limit"},
     {"clock_analysis", "floorplan clock_analysis: clock nets per region"},
-    {"make_pin_compatible", "floorplan make_pin_compatible S1 S2 S3 S4: keeps the pins of two devices compatible"},
-    {"zoom", "floorplan zoom LEFT RIGHT: shows the sites from LEFT to RIGHT"},
+    {"make_pin_compatible", "floorplan make_pin_compatible FROM TO OFFSET MODE: the ports TO take the sites of the ports FROM, MODE copy (moved by OFFSET \"dx dy\") or swap"},
+    {"zoom", "floorplan zoom SITE SITE: shows the sites between two corners; zoom block NAME a block's region"},
     {"refresh", "floorplan refresh: recomputes the floorplan view"},
 };
 

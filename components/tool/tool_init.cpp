@@ -1,8 +1,9 @@
 // Brings the tool up in an interpreter: its state, the root object commands (projmgr, project,
 // collection, settings, obj, view, highlight, selection, search, timing, floorplan) and the
-// convenience command kelmartool::open.
+// convenience commands kelmartool::open and kelmartool::help.
 #include <tcl.h>
 
+#include <cstring>
 #include <string>
 
 #include "CitI/IScriptHandle.h"
@@ -70,6 +71,49 @@ int OpenCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[])
     return ok == 1 ? TCL_OK : TCL_ERROR;
 }
 
+// The root words and the interfaces behind them, in the order a user meets them.
+struct Root {
+    const char* word;
+    const char* interfaceName;
+};
+constexpr Root kRoots[] = {
+    {"projmgr", TcltaskI::ITclProjectMgr::NAME},   {"project", TcltaskI::ITclProject::NAME},
+    {"collection", TcltaskI::ICollection::NAME},   {"settings", TcltaskI::IGlobal::NAME},
+    {"obj", TcltaskI::IObject::NAME},              {"view", TcltaskI::IGraphicalView::NAME},
+    {"highlight", TcltaskI::IHighlight::NAME},     {"selection", TcltaskI::ISelection::NAME},
+    {"search", TcltaskI::ISearch::NAME},           {"timing", TcltaskI::ITimingAnalysis::NAME},
+    {"floorplan", TcltaskI::IXFloorplan::NAME},
+};
+
+// kelmartool::help ?ROOT? ?WORD?: the root words with what they are, the command words of one
+// root, or the usage of one command word; the same texts a wrong call shows.
+int HelpCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
+    if (objc > 3) {
+        Tcl_WrongNumArgs(interp, 1, objv, "?root? ?word?");
+        return TCL_ERROR;
+    }
+    if (objc == 1) {
+        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+        for (const Root& root : kRoots) {
+            CommonI::RefCountPtr<ICommandHelp> help(kelmartool::NewCommandHelp(root.interfaceName));
+            Tcl_ListObjAppendElement(interp, list, Tcl_NewStringObj(root.word, -1));
+            Tcl_ListObjAppendElement(interp, list, Tcl_NewStringObj(help->GetSummary().c_str(), -1));
+        }
+        Tcl_SetObjResult(interp, list);
+        return TCL_OK;
+    }
+    const char* word = Tcl_GetString(objv[1]);
+    for (const Root& root : kRoots) {
+        if (std::strcmp(root.word, word) != 0) continue;
+        CommonI::RefCountPtr<ICommandHelp> help(kelmartool::NewCommandHelp(root.interfaceName));
+        const Port_String text = objc == 2 ? help->GetTopics() : help->GetHelp(Tcl_GetString(objv[2]));
+        Tcl_SetObjResult(interp, Tcl_NewStringObj(text.c_str(), text.Length()));
+        return TCL_OK;
+    }
+    Tcl_SetObjResult(interp, Tcl_ObjPrintf("no root command is named \"%s\"", word));
+    return TCL_ERROR;
+}
+
 }  // namespace
 
 namespace kelmartool {
@@ -105,5 +149,6 @@ extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp
     if (!published) return TCL_ERROR;
 
     Tcl_CreateObjCommand(interp, "::kelmartool::open", OpenCommand, nullptr, nullptr);
+    Tcl_CreateObjCommand(interp, "::kelmartool::help", HelpCommand, nullptr, nullptr);
     return TCL_OK;
 }
