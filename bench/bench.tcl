@@ -1,9 +1,9 @@
 # The cost of one call of the package, measured against three baselines in the same process:
 # a native command (the limit), a SWIG-generated binding and plain Tcl. Every case runs in a
-# compiled loop; the rounds visit the cases in turn, so a slow moment of the machine falls on all of
-# them alike and each ratio is taken within one round. Then one million calls each of a matched
-# method and of a method that hands out an object, with the resident memory and the object
-# commands counted before and after: both must stay flat.
+# compiled loop; within a round the cases take turns in short slices, so a slow moment of the
+# machine falls on all of them alike, and each ratio is taken within one round. Then one million
+# calls each of a matched method and of a method that hands out an object, with the resident memory
+# and the object commands counted before and after: both must stay flat.
 #
 #   tclsh8.6 bench.tcl -lib DIR -native FILE ?-swig FILE? ?-json FILE?
 #                      ?-rounds N? ?-seconds S? ?-calls N?
@@ -17,6 +17,8 @@ namespace eval bench {
                       -calls 1000000]
     # Calls run in chunks of this many, so the kit's call records can be dropped between chunks.
     variable chunk 1000
+    # The turns that the cases take within one round.
+    variable slices 10
     # Growth of the resident set, in kB, that a memory run may show before it counts as a leak:
     # allocator slack, not a per-call loss, which at a million calls would be far larger.
     variable rssSlackKb 4096
@@ -73,7 +75,7 @@ proc bench::Setup {} {
         Case swig "SWIG binding" {$sink Take x}
     }
     Case plain "plain Tcl (TclOO)" {$plain equal a b -order}
-    Case loop "empty loop" {}
+    Case loop "loop alone (in every row)" {}
     Case close "plain method" {$project Close} project
     Case sync "plain method with OUT variable" {$project Sync msg} project
     Case get "matched, no options" {$coll get x} coll
@@ -144,6 +146,7 @@ proc bench::Measure {} {
     variable opt
     variable cases
     variable chunk
+    variable slices
     set keys [dict keys $cases]
     foreach key $keys {
         dict with cases $key {
@@ -155,18 +158,25 @@ proc bench::Measure {} {
     }
     set rounds [dict get $opt -rounds]
     for {set r 0} {$r < $rounds} {incr r} {
-        # Each round starts one case later, so no case always runs first or last.
-        set shift [expr {$r % [llength $keys]}]
-        set order [concat [lrange $keys $shift end] [lrange $keys 0 [expr {$shift - 1}]]]
-        set round {}
-        foreach key $order {
-            set chunks [dict get $cases $key chunks]
-            dict set round $key [expr {[Time ::bench::loop_$key $chunks] * 1000.0 / ($chunks * $chunk)}]
+        set used [dict map {key case} $cases {expr 0}]
+        set calls [dict map {key case} $cases {expr 0}]
+        # A round runs every case in slices, taking turns, so that a busy moment of the machine
+        # falls on all cases of the round alike; each slice starts one case later than the last.
+        for {set s 0} {$s < $slices} {incr s} {
+            set shift [expr {($r * $slices + $s) % [llength $keys]}]
+            foreach key [concat [lrange $keys $shift end] [lrange $keys 0 [expr {$shift - 1}]]] {
+                set chunks [expr {max(1, [dict get $cases $key chunks] / $slices)}]
+                dict incr used $key [Time ::bench::loop_$key $chunks]
+                dict incr calls $key [expr {$chunks * $chunk}]
+            }
         }
         foreach key $keys {
-            set ns [dict get $round $key]
-            lappend times($key) $ns
-            lappend ratios($key) [expr {$ns / [dict get $round native]}]
+            set ns($key) [expr {[dict get $used $key] * 1000.0 / [dict get $calls $key]}]
+            lappend times($key) $ns($key)
+            dict set cases $key calls [dict get $calls $key]
+        }
+        foreach key $keys {
+            lappend ratios($key) [expr {$ns($key) / $ns(native)}]
         }
         puts stderr "round [expr {$r + 1}]/$rounds done"
     }
@@ -228,8 +238,7 @@ proc bench::Report {} {
     puts [string repeat - 107]
     dict for {key case} $cases {
         dict with case {
-            puts [format $format $name $command [format %.1f $ns] [format %.2f $ratio] \
-                      [expr {$chunks * $::bench::chunk}]]
+            puts [format $format $name $command [format %.1f $ns] [format %.2f $ratio] $calls]
         }
     }
     puts ""
@@ -256,8 +265,7 @@ proc bench::Json {file} {
     dict for {key case} $cases {
         dict with case {
             lappend rows [format {    {"key": %s, "case": %s, "command": %s, "ns_per_call": %.2f, "ratio_to_native": %.3f, "calls_per_round": %d, "rounds_ns": [%s]}} \
-                              [JsonString $key] [JsonString $name] [JsonString $command] $ns $ratio \
-                              [expr {$chunks * $::bench::chunk}] \
+                              [JsonString $key] [JsonString $name] [JsonString $command] $ns $ratio $calls \
                               [join [lmap v $rounds {format %.2f $v}] {, }]]
         }
     }
