@@ -1,0 +1,468 @@
+// Fetch and Store by direction, the property result store, and the dispatch paths that no script
+// reaches, in a real interpreter with the package and the test kit loaded.
+#include <gtest/gtest.h>
+#include <tcl.h>
+
+#include <filesystem>
+#include <stdexcept>
+#include <string>
+
+#include "CitP/Factory.h"
+#include "Script/KelmarPkg.h"
+#include "TcltaskI/ITclProject.h"
+#include "marshal/fetch_store.h"
+#include "marshal/property.h"
+
+namespace {
+
+using TcltaskI::Fetch_InterfaceType;
+using TcltaskI::Fetch_Type;
+using TcltaskI::Store_InterfaceType;
+using TcltaskI::Store_Type;
+
+std::string LibraryDir() {
+    if (const char* dir = getenv("KELMAR_LIB")) return dir;
+    return std::filesystem::read_symlink("/proc/self/exe").parent_path().string() + "/../lib";
+}
+
+// A counted object of interface I that says when it ends.
+template <class I>
+class Counted : public I {
+public:
+    explicit Counted(bool* ended = nullptr) : m_ended(ended) {}
+    ~Counted() override {
+        if (m_ended) *m_ended = true;
+    }
+    CitI::IInterface* GetInterface(const Port::XUID& id) override {
+        if (id == CommonI::IRefCountID) return &m_counter;
+        if (id == CitI::IInterfaceID || Answers(id)) return this;
+        return nullptr;
+    }
+    long Count() const { return m_counter.Count(); }
+
+protected:
+    virtual bool Answers(const Port::XUID& id) { return id == I::IID; }
+
+private:
+    CommonI::RefCounter m_counter{this};
+    bool* m_ended;
+};
+
+// A property whose conversion to Tcl succeeds with `text`, or fails adding to the message it is given.
+class FakeProperty final : public Counted<UtilI::ITclProperty> {
+public:
+    FakeProperty(const char* text, bool converts, bool* ended = nullptr)
+        : Counted(ended), m_text(text), m_converts(converts) {}
+    CommonI::RESULT ToTclObj(Tcl_Obj*& out, Port_String& message) override {
+        if (!m_converts) {
+            message += " and the value is unreadable";
+            return 0;
+        }
+        out = Tcl_NewStringObj(m_text, -1);
+        return 1;
+    }
+    CommonI::RESULT FromTclObj(Tcl_Obj*, Port_String&) override { return 1; }
+
+private:
+    const char* m_text;
+    bool m_converts;
+};
+
+class FakeHDProject final : public Counted<HdcI::IHDProject> {
+public:
+    Port_String GetName() override { return "hd"; }
+    Port_String GetFileName() override { return "hd.prj"; }
+};
+
+class FakeHelper final : public Dpm::IProjectHelper {
+public:
+    CitI::IInterface* GetInterface(const Port::XUID& id) override {
+        return id == CitI::IInterfaceID ? this : nullptr;
+    }
+    Port_String GetName() override { return "helper"; }
+};
+
+// A project that throws when asked for a face it does not know.
+class ThrowingProject final : public Counted<TcltaskI::ITclProject> {
+public:
+    CommonI::RESULT OpenWithHelper(const Port_String&, Dpm::IProjectHelper*, Port_String&) override { return 1; }
+    CommonI::RESULT Close() override { return 1; }
+    Port_String GetFileName() override { return {}; }
+    HdcI::MIHDProject GetHDProject() override { return nullptr; }
+    Dpm::IProjectHelper* GetProjectHelper() override { return nullptr; }
+    CommonI::RESULT Sync(Port_String&) override { return 1; }
+    CommonI::RESULT Reload(Port_String&) override { return 1; }
+    CommonI::RESULT RegisterComponent(const Port::XUID&, CitI::MIInterface&) override { return 1; }
+    CommonI::RESULT UnRegisterComponent(CitI::MIInterface&) override { return 1; }
+    CitI::MIInterface GetComponent(const Port::XUID&) override { return nullptr; }
+
+protected:
+    bool Answers(const Port::XUID& id) override {
+        if (id == TcltaskI::ITclProjectID) return true;
+        throw std::runtime_error("no such face");
+    }
+};
+
+// A word whose text is not to be had.
+class TextlessHandle final : public Script::Handle {
+public:
+    Tcl_Obj* GetTclObj() override { return nullptr; }
+    const char* GetString() override { return nullptr; }
+    void SetResult(Tcl_Interp*) override {}
+    void SetVariable(Tcl_Interp*, const char*) override {}
+    Script::Handle* NewHandle(Tcl_Interp*) override { return nullptr; }
+    Script::Handle* GetSharedHandle() override { return nullptr; }
+};
+
+class Marshal : public ::testing::Test {
+protected:
+    static void SetUpTestSuite() {
+        Tcl_FindExecutable(nullptr);
+        interp = Tcl_CreateInterp();
+        Kelmarpkg_Init(interp);
+        const std::string dir = LibraryDir();
+        ASSERT_EQ(Eval(("load " + dir + "/libTcltaskI_Morvane.so Tcltaski_morvane").c_str()), TCL_OK) << Result();
+        ASSERT_EQ(Eval(("load " + dir + "/libTcltaskI_TestKit.so Tcltaski_testkit").c_str()), TCL_OK) << Result();
+        ASSERT_TRUE(CitP::Factory::LoadLibraryFactory("libTcltask_Support"));
+    }
+    static void TearDownTestSuite() { Tcl_DeleteInterp(interp); }
+
+    // Starts errorInfo with a text of its own, so that a report without reset shows behind it.
+    void SetUp() override {
+        Tcl_ResetResult(interp);
+        Tcl_AddErrorInfo(interp, "earlier|");
+        Tcl_SetObjResult(interp, Tcl_NewStringObj("held", -1));
+    }
+
+    static int Eval(const char* script) { return Tcl_Eval(interp, script); }
+    static std::string Result() { return Tcl_GetStringResult(interp); }
+    static std::string ErrorInfo() {
+        Tcl_Obj* options = Tcl_GetReturnOptions(interp, TCL_ERROR);
+        Tcl_IncrRefCount(options);
+        Tcl_Obj* key = Tcl_NewStringObj("-errorinfo", -1);
+        Tcl_IncrRefCount(key);
+        Tcl_Obj* info = nullptr;
+        Tcl_DictObjGet(nullptr, options, key, &info);
+        std::string text = info ? Tcl_GetString(info) : "";
+        Tcl_DecrRefCount(key);
+        Tcl_DecrRefCount(options);
+        return text;
+    }
+    static std::string Var(const char* name) {
+        const char* value = Tcl_GetVar(interp, name, TCL_GLOBAL_ONLY);
+        return value ? value : "<unset>";
+    }
+    // The result of a report without reset: the text in the result, behind the earlier errorInfo.
+    static void ExpectReportWithoutReset(int status, const std::string& text) {
+        EXPECT_EQ(status, 1);
+        EXPECT_EQ(Result(), text);
+        EXPECT_EQ(ErrorInfo(), "earlier|" + text);
+    }
+    // The wrapper behind a word that a script holds.
+    static Script::Handle* HandleOf(const std::string& word) {
+        Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
+        Tcl_IncrRefCount(obj);
+        Script::Handle* handle = Script::PtrHandleBase::GetHandleFromTclObj(obj);
+        Tcl_DecrRefCount(obj);
+        return handle;
+    }
+    static std::string Made(const char* script) {
+        EXPECT_EQ(Eval(script), TCL_OK) << Result();
+        return Result();
+    }
+
+    static inline Tcl_Interp* interp = nullptr;
+};
+
+using Word = Script::TclStringHandle;
+
+// Directions that no command uses ---------------------------------------------------------------
+
+TEST_F(Marshal, FetchTypeRefusesOutAndResult) {
+    Word word("0", interp);
+    Dpm::IProjectHelper* helper = nullptr;
+    ExpectReportWithoutReset(Fetch_Type(helper, interp, &word, Script::OUT),
+                             "Tetch_Type was called for an OUT parameter, which indicates a failure.");
+    SetUp();
+    ExpectReportWithoutReset(Fetch_Type(helper, interp, nullptr, Script::RESULT),
+                             "Fetch_Type was called for a RESULT, which indicates a failure.");
+}
+
+TEST_F(Marshal, FetchInterfaceTypeRefusesOutAndResult) {
+    Word word("x", interp);
+    CitI::MIInterface component;
+    ExpectReportWithoutReset(Fetch_InterfaceType(component, interp, &word, Script::OUT),
+                             "Fetch_InterfaceType was called for an OUT parameter, which indicates a failure.");
+    SetUp();
+    ExpectReportWithoutReset(Fetch_InterfaceType(component, interp, nullptr, Script::RESULT),
+                             "Fetch_InterfaceType was called for a RESULT, which indicates a failure");
+
+    UtilI::MITclProperty property;
+    SetUp();
+    ExpectReportWithoutReset(
+        Fetch_InterfaceType(property, interp, &word, Script::OUT),
+        "Fetch_InterfaceType<UtilI::ITclProperty> was called for an OUT parameter, which indicates a failure.");
+    SetUp();
+    ExpectReportWithoutReset(Fetch_InterfaceType(property, interp, nullptr, Script::RESULT),
+                             "Fetch_InterfaceType was called for a RESULT, which indicates a failure");
+    EXPECT_FALSE(property);
+}
+
+TEST_F(Marshal, StoresRefuseInAndAnOutWithoutVariable) {
+    FakeHelper helper;
+    ExpectReportWithoutReset(Store_Type<Dpm::IProjectHelper>(&helper, interp, nullptr, Script::IN),
+                             "Store_Type was called for an IN parameter, which  indicates a failure.");
+    SetUp();
+    ExpectReportWithoutReset(Store_Type<Dpm::IProjectHelper>(&helper, interp, nullptr, Script::OUT),
+                             "Store_Type was called for an OUT parameter, but the variable is NULL");
+    SetUp();
+    ExpectReportWithoutReset(Store_Type<Dpm::IProjectHelper>(nullptr, interp, nullptr, Script::OUT),
+                             "Store_Type was called for an OUT parameter, but the variable is NULL");
+
+    HdcI::MIHDProject project(new FakeHDProject);
+    SetUp();
+    ExpectReportWithoutReset(Store_InterfaceType(project, interp, nullptr, Script::IN),
+                             "Store_InterfaceType was called for an IN parameter, which  indicates a failure.");
+    SetUp();
+    ExpectReportWithoutReset(Store_InterfaceType(project, interp, nullptr, Script::OUT),
+                             "Store_InterfaceType was called for an OUT parameter, but the variable is NULL");
+    SetUp();
+    ExpectReportWithoutReset(Store_InterfaceType(HdcI::MIHDProject(), interp, nullptr, Script::OUT),
+                             "Store_InterfaceType was called for an OUT parameter, but the variable is NULL");
+    EXPECT_EQ(static_cast<FakeHDProject*>(project.get())->Count(), 1);
+}
+
+// Objects in and out ------------------------------------------------------------------------------
+
+TEST_F(Marshal, NullObjectsAreTheIntegerZero) {
+    Word name("nullOut", nullptr);
+    EXPECT_EQ(Store_Type<Dpm::IProjectHelper>(nullptr, interp, &name, Script::OUT), 0);
+    EXPECT_EQ(Var("nullOut"), "0");
+    EXPECT_EQ(Store_Type<Dpm::IProjectHelper>(nullptr, interp, nullptr, Script::RESULT), 0);
+    EXPECT_EQ(Result(), "0");
+    Tcl_SetObjResult(interp, Tcl_NewStringObj("held", -1));
+    EXPECT_EQ(Store_InterfaceType(HdcI::MIHDProject(), interp, nullptr, Script::RESULT), 0);
+    EXPECT_EQ(Result(), "0");
+    Word other("nullOther", nullptr);
+    EXPECT_EQ(Store_InterfaceType(HdcI::MIHDProject(), interp, &other, Script::OUT), 0);
+    EXPECT_EQ(Var("nullOther"), "0");
+
+    // And 0, NULL come back as null; other words are no object.
+    for (const char* text : {"0", "NULL", "0x0"}) {
+        Word word(text, interp);
+        FakeHelper placeholder;
+        Dpm::IProjectHelper* helper = &placeholder;
+        EXPECT_EQ(Fetch_Type(helper, interp, &word, Script::IN), 0) << text;
+        EXPECT_EQ(helper, nullptr) << text;
+        CitI::MIInterface component(new Counted<CitI::IInterface>);
+        EXPECT_EQ(Fetch_InterfaceType(component, interp, &word, Script::IN), 0) << text;
+        EXPECT_FALSE(component) << text;
+    }
+    Word junk("junk", interp);
+    CitI::MIInterface component;
+    SetUp();
+    ExpectReportWithoutReset(Fetch_InterfaceType(component, interp, &junk, Script::IN),
+                             "Unable to fetch an object of Interface type from parameter");
+}
+
+TEST_F(Marshal, ObjectsGoOutAsWrappersAndComeBack) {
+    bool ended = false;
+    auto* raw = new FakeHDProject;
+    auto* other = new FakeHDProject;
+    HdcI::MIHDProject project(raw), result(other);
+    Word name("hdOut", nullptr);
+    ASSERT_EQ(Store_InterfaceType(project, interp, &name, Script::OUT), 0);
+    const std::string word = Var("hdOut");
+    ASSERT_EQ(Store_InterfaceType(result, interp, nullptr, Script::RESULT), 0);
+    const std::string resultWord = Result();
+    // Each wrapper holds a reference of its own.
+    EXPECT_EQ(raw->Count(), 2);
+    EXPECT_EQ(other->Count(), 2);
+    EXPECT_NE(word, resultWord);
+
+    // No factory makes a wrapper of a property.
+    UtilI::MITclProperty property(new FakeProperty("v", true, &ended));
+    SetUp();
+    ExpectReportWithoutReset(Store_InterfaceType(property, interp, nullptr, Script::RESULT),
+                             "Store_InterfaceType was called for a type that does not exist in Script::TclWrapFactory");
+    property = nullptr;
+    EXPECT_TRUE(ended);
+
+    // A helper goes out as a handle of its own type and comes back as the same pointer.
+    FakeHelper helper;
+    ASSERT_EQ(Store_Type<Dpm::IProjectHelper>(&helper, interp, nullptr, Script::RESULT), 0);
+    const std::string helperWord = Result();
+    Word back(helperWord.c_str(), interp);
+    Dpm::IProjectHelper* fetched = nullptr;
+    EXPECT_EQ(Fetch_Type(fetched, interp, HandleOf(helperWord), Script::IN), 0);
+    EXPECT_EQ(fetched, &helper);
+    // The bare word is no handle: only the support's handle behind it carries the pointer.
+    SetUp();
+    ExpectReportWithoutReset(Fetch_Type(fetched, interp, &back, Script::IN), "Unable to fetch an object from parameter");
+
+    EXPECT_EQ(Eval(("rename " + word + " {}; rename " + resultWord + " {}; rename " + helperWord + " {}").c_str()), TCL_OK)
+        << Result();
+    EXPECT_EQ(raw->Count(), 1);
+    EXPECT_EQ(other->Count(), 1);
+}
+
+TEST_F(Marshal, ComponentsComeInCountedFromHandlesAndVariables) {
+    const std::string word = Made("testkit::component fetched");
+    Script::Handle* handle = HandleOf(word);
+    ASSERT_NE(handle, nullptr);
+    CitI::MIInterface component;
+    ASSERT_EQ(Fetch_InterfaceType(component, interp, handle, Script::IN), 0);
+    ASSERT_TRUE(component);
+
+    // INOUT: a variable that holds no handle, or none at all, is a null component and no failure.
+    Eval(("set holder " + word + "; set plain text").c_str());
+    for (const char* variable : {"holder", "plain", "nosuch"}) {
+        Word name(variable, interp);
+        CitI::MIInterface fromVariable(component);
+        EXPECT_EQ(Fetch_InterfaceType(fromVariable, interp, &name, Script::INOUT), 0) << variable;
+        EXPECT_EQ(fromVariable.get(), std::string(variable) == "holder" ? component.get() : nullptr) << variable;
+    }
+    component = nullptr;
+    EXPECT_EQ(Eval(("rename " + word + " {}").c_str()), TCL_OK);
+}
+
+// Properties --------------------------------------------------------------------------------------
+
+std::string TextOf(const UtilI::MITclProperty& property) {
+    Tcl_Obj* value = nullptr;
+    Port_String message;
+    if (!property || property->ToTclObj(value, message) != 1) return "<none>";
+    Tcl_IncrRefCount(value);
+    std::string text = Tcl_GetString(value);
+    Tcl_DecrRefCount(value);
+    return text;
+}
+
+TEST_F(Marshal, PropertiesAreMadeFromTheWordOrTheVariable) {
+    bool ended = false;
+    UtilI::MITclProperty property(new FakeProperty("old", true, &ended));
+    Word word("a {b c}", interp);
+    ASSERT_EQ(Fetch_InterfaceType(property, interp, &word, Script::IN), 0);
+    EXPECT_TRUE(ended);  // the reference held before is given back
+    EXPECT_EQ(TextOf(property), "a {b c}");
+
+    Eval("set propertyVariable {from the variable}");
+    Word name("propertyVariable", interp);
+    UtilI::MITclProperty fromVariable;
+    ASSERT_EQ(Fetch_InterfaceType(fromVariable, interp, &name, Script::INOUT), 0);
+    EXPECT_EQ(TextOf(fromVariable), "from the variable");
+    EXPECT_NE(fromVariable.get(), property.get());
+
+    // No variable: a null property and success, with Tcl's message left in the result.
+    Word missing("noPropertyVariable", interp);
+    EXPECT_EQ(Fetch_InterfaceType(fromVariable, interp, &missing, Script::INOUT), 0);
+    EXPECT_FALSE(fromVariable);
+    EXPECT_EQ(Result(), "can't read \"noPropertyVariable\": no such variable");
+}
+
+TEST_F(Marshal, NoPropertyComponentIsTheCreationFailure) {
+    CitP::Factory::SetCreateFilter([](const Port::XUID& id) { return !(id == UtilI::TclPropertyID); });
+    Word word("value", interp);
+    Eval("set propertyVariable value");
+    Word name("propertyVariable", interp);
+    UtilI::MITclProperty property;
+    SetUp();
+    ExpectReportWithoutReset(Fetch_InterfaceType(property, interp, &word, Script::IN),
+                             "Unable to create an comopoent that implements UtilI::ITclProperty interface");
+    SetUp();
+    ExpectReportWithoutReset(Fetch_InterfaceType(property, interp, &name, Script::INOUT),
+                             "Unable to create an comopoent that implements UtilI::ITclProperty interface");
+    CitP::Factory::SetCreateFilter(nullptr);
+}
+
+TEST_F(Marshal, ResultStoreOfAProperty) {
+    Port_String message("op said");
+    // None: an empty result, whatever stood there.
+    EXPECT_EQ(TcltaskI::StoreResultProperty(UtilI::MITclProperty(), message, interp), TCL_OK);
+    EXPECT_EQ(Result(), "");
+
+    EXPECT_EQ(TcltaskI::StoreResultProperty(UtilI::MITclProperty(new FakeProperty("x y", true)), message, interp), TCL_OK);
+    EXPECT_EQ(Result(), "x y");
+
+    // A failed conversion is a successful command whose result tells it, with the message the
+    // operation left, and nothing in errorInfo.
+    SetUp();
+    EXPECT_EQ(TcltaskI::StoreResultProperty(UtilI::MITclProperty(new FakeProperty("", false)), message, interp), TCL_OK);
+    EXPECT_EQ(Result(),
+              "ERROR occurred when converting UtilI::ITclProperty interface object to Tcl_Obj: op said and the value is unreadable");
+    EXPECT_EQ(ErrorInfo(), "earlier|");
+}
+
+// Dispatch paths that no script reaches -----------------------------------------------------------
+
+TEST_F(Marshal, AWordWithoutTextIsNULL) {
+    const std::string word = Made("testkit::new ISearch");
+    Word self(word.c_str(), interp);
+    TextlessHandle textless;
+    Script::Handle* argv[] = {&self, &textless};
+    SetUp();
+    EXPECT_EQ(HandleOf(word)->Execute(2, argv, interp), 1);
+    EXPECT_EQ(Result(), "Unknown command NULL for TcltaskI::TclWrapISearch\n"
+                        "  Valid commands for this object are:\n    search\n    GetInterface\n");
+    // The unknown word resets: what errorInfo held before is gone.
+    EXPECT_EQ(ErrorInfo().rfind(Result(), 0), 0u);
+    EXPECT_EQ(Eval(("rename " + word + " {}").c_str()), TCL_OK);
+}
+
+TEST_F(Marshal, TooFewWordsAndGetInterfaceFailuresDoNotReset) {
+    const std::string word = Made("testkit::new ISearch");
+    const std::string orphan = Made("testkit::orphan ISearch");
+    Word self(word.c_str(), interp), search("search", interp), getInterface("GetInterface", interp),
+        id(Tcl_GetVar(interp, "::kelmar::TcltaskI::ISearchID", TCL_GLOBAL_ONLY), interp);
+    Script::Handle* tooFew[] = {&self, &search};
+    SetUp();
+    ExpectReportWithoutReset(HandleOf(word)->Execute(2, tooFew, interp),
+                             "Wrong number of arguments: '" + word.substr(10) + " search'\nPlease type 'help " +
+                                 word.substr(10) + " search' to get more information");
+    SetUp();
+    Script::Handle* noObject[] = {&self, &getInterface, &id};
+    ExpectReportWithoutReset(HandleOf(orphan)->Execute(3, noObject, interp),
+                             "Failed to get TcltaskI::ISearch in TcltaskI::TclWrapISearch::GetInterface.");
+    EXPECT_EQ(Eval(("rename " + word + " {}; rename " + orphan + " {}").c_str()), TCL_OK);
+}
+
+TEST_F(Marshal, GetInterfaceCatchesAnException) {
+    auto* project = new ThrowingProject;
+    CitI::MIInterface owner(static_cast<TcltaskI::ITclProject*>(project));
+    CitI::IInterface* made = Script::TclWrapFactory::CreateInstance(TcltaskI::ITclProjectID, owner.get(), interp);
+    ASSERT_NE(made, nullptr);
+    auto* script = static_cast<CitI::IScriptHandle*>(made->GetInterface(CitI::IScriptHandleID));
+    ASSERT_NE(script, nullptr);
+    script->SetResult(interp);
+    const std::string word = Result();
+    owner = nullptr;  // the wrapper holds the object from here on
+
+    SetUp();
+    EXPECT_EQ(Eval((word + " GetInterface 11111111-2222-3333-4444-555555555555").c_str()), TCL_ERROR);
+    EXPECT_EQ(Result(), "An exception took place while calling TcltaskI::TclWrapITclProject::GetInterface.");
+    EXPECT_EQ(Eval((word + " GetInterface $::kelmar::TcltaskI::ITclProjectID").c_str()), TCL_OK) << Result();
+    EXPECT_EQ(Result(), word);
+    EXPECT_EQ(project->Count(), 1);
+    EXPECT_EQ(Eval(("rename " + word + " {}").c_str()), TCL_OK);
+}
+
+TEST_F(Marshal, AnOutObjectWithoutVariableEndsTheMethodBeforeTheString) {
+    const std::string manager =
+        Made("testkit::new ITclProjectMgr -handler {apply {{op args} {return {object new message said code 5}}}}");
+    Word self(manager.c_str(), interp), message("messageOut", nullptr);
+    Eval("unset -nocomplain messageOut");
+    for (const char* command : {"GetCurrentTclProject", "GetCurrentHDProject", "GetCurrentProjectHelper"}) {
+        Word word(command, interp);
+        Script::Handle* argv[] = {&self, &word, nullptr, &message};
+        EXPECT_EQ(HandleOf(manager)->Execute(4, argv, interp), 1) << command;
+        EXPECT_EQ(Result(), std::string(command) == "GetCurrentProjectHelper"
+                                ? "Store_Type was called for an OUT parameter, but the variable is NULL"
+                                : "Store_InterfaceType was called for an OUT parameter, but the variable is NULL")
+            << command;
+        EXPECT_EQ(Var("messageOut"), "<unset>") << command;
+    }
+    EXPECT_EQ(Made(("testkit::calls " + manager).c_str()), "GetCurrentTclProject GetCurrentHDProject GetCurrentProjectHelper");
+    EXPECT_EQ(Eval(("rename " + manager + " {}").c_str()), TCL_OK);
+}
+
+}  // namespace
