@@ -269,7 +269,9 @@ TEST(StringBase, TrimRemovesOneLeadingInstance) {
         EXPECT_EQ(s.Trim(c.cut, Port::TrimLeadingOnce), c.trimmed);
         ExpectWellFormed(s, c.expected);
     }
-    Port_String heap(("-" + std::string(60, 'w')).c_str());
+    std::string dashed(61, 'w');
+    dashed[0] = '-';
+    Port_String heap(dashed.c_str());
     EXPECT_TRUE(heap.Trim("-", Port::TrimLeadingOnce));
     ExpectWellFormed(heap, std::string(60, 'w'));
 }
@@ -311,7 +313,9 @@ TEST(XUID, TextFormRoundTrips) {
         std::string upper = c.text;
         for (char& ch : upper) ch = static_cast<char>(std::toupper(static_cast<unsigned char>(ch)));
         EXPECT_TRUE(Port::XUID(upper.c_str()) == id);
-        EXPECT_TRUE(Port::XUID(("{" + std::string(c.text) + "}").c_str()) == id);
+        std::string braced("{");
+        braced.append(c.text).append("}");
+        EXPECT_TRUE(Port::XUID(braced.c_str()) == id);
     }
 }
 
