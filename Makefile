@@ -55,4 +55,4 @@ bench: bench-deps
 	mkdir -p $(BUILD) && cp $(BENCH_BUILD)/bench.json $(BUILD)/bench.json
 
 clean:
-	rm -rf $(BUILD) $(SAN_BUILD)
+	rm -rf $(BUILD) $(SAN_BUILD) $(BENCH_BUILD)
