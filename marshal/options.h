@@ -71,9 +71,9 @@ struct DefaultLine {
     Tcl_Obj* line = nullptr;
     Tcl_Obj* variable = nullptr;
 };
-// "namespace eval <class>::<word> {set <var> <default>}" and "<class>::<word>::<var>", with <var>
-// the name in two underscores either side in a matched method and bare in a switch method. The
-// class name loses its leading "TcltaskI::" nowhere: the namespaces are relative.
+// "namespace eval <class>::<word> {variable <var>; set <var> <default>}" and
+// "<class>::<word>::<var>", with <var> the name in two underscores either side in a matched method
+// and bare in a switch method. Both names are relative: they resolve from the namespace Tcl is in.
 void MakeDefaultLine(DefaultLine& out, const char* className, const char* word, const Option& option, bool matched);
 // Runs the line, as Tcl_Eval of its text would; gives the Tcl code.
 int RunDefaultLine(Tcl_Interp* interp, const DefaultLine& line);
