@@ -9,8 +9,7 @@ int ReportUnknownWord(Tcl_Interp* interp, const char* word, const char* classNam
     return ReportWithoutReset(interp, text);
 }
 
-int ReportTooFew(Tcl_Interp* interp, CountMessage form, const char* signature, int,
-                 Script::Handle* const* argv) {
+int ReportTooFew(Tcl_Interp* interp, CountMessage form, const char* signature, Script::Handle* const* argv) {
     if (form == CountMessage::Signature)
         return ReportWithoutReset(interp, Port_String("Wrong number of arguments for ", signature));
     Port_String object(argv[0]->GetString());

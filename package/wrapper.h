@@ -40,8 +40,7 @@ enum class WordCompare { Bytes, UtStr };
 
 // Texts of the dispatch that depend on nothing but the call; shared by the eleven classes.
 int ReportUnknownWord(Tcl_Interp* interp, const char* word, const char* className, const Port_String& listing);
-int ReportTooFew(Tcl_Interp* interp, CountMessage form, const char* signature, int argc,
-                 Script::Handle* const* argv);
+int ReportTooFew(Tcl_Interp* interp, CountMessage form, const char* signature, Script::Handle* const* argv);
 
 template <class W, class I, CountMessage Form, WordCompare Compare>
 class TclWrap : public Script::PtrHandle<I> {
@@ -96,7 +95,7 @@ public:
                 for (const Entry& row : W::table) {
                     if (!Matches(typed, row.name)) continue;
                     if (row.required + 2 > argc)
-                        return ReportTooFew(interp, Form, row.signature, argc, argv);
+                        return ReportTooFew(interp, Form, row.signature, argv);
                     return (static_cast<W*>(this)->*row.handler)(argc, argv, interp);
                 }
             }
@@ -122,7 +121,12 @@ public:
     }
 
     // The wrapped object: 0 and the pointer, or 1 when the wrapper holds none.
-    int Object(I** out) const { return this->GetValue(reinterpret_cast<void**>(out)); }
+    int Object(I** out) const {
+        void* value = nullptr;
+        const int rc = this->GetValue(&value);
+        *out = static_cast<I*>(value);
+        return rc;
+    }
 
     // The method of a declared command, run by the frame its declaration names.
     template <const auto& D>
