@@ -29,6 +29,7 @@
 #include "TcltaskI/IXFloorplan.h"
 #include "component.h"
 #include "floorplan_model.h"
+#include "floorplan_values.h"
 #include "project.h"
 #include "property.h"
 
@@ -45,12 +46,7 @@ constexpr const char* kNotOpen = "no floorplan is open: open one with floorplan 
 constexpr const char* kNameKey = "floorplan_name";
 constexpr const char* kClockLimitKey = "clock_limit";
 
-const std::vector<std::string> kProperties{"name",     "design",      "device", "columns",     "rows",
-                                           "site_capacity", "banks", "sso_limit", "clock_limit", "blocks",
-                                           "prohibited", "modified", "view"};
 const std::vector<std::string> kWritable{"name", "site_capacity", "sso_limit", "clock_limit"};
-const std::vector<std::string> kBlockProperties{"name", "cells", "size", "region", "capacity", "sites", "constraints"};
-
 std::string Quote(const std::string& name) { return "'" + name + "'"; }
 
 std::string Join(const std::vector<std::string>& words, const char* separator = ", ") {
@@ -77,22 +73,6 @@ std::vector<std::string> Words(const std::string& text) {
         for (int i = 0; i < count; ++i) words.emplace_back(Tcl_GetString(items[i]));
     return words;
 }
-
-// Sites in the order of the device: row by row.
-std::vector<std::string> SiteOrder(const std::set<std::string>& sites) {
-    std::vector<std::pair<std::pair<int, int>, std::string>> keyed;
-    for (const std::string& s : sites) {
-        int x = 0, y = 0;
-        ParseSiteName(s, x, y);
-        keyed.push_back({{y, x}, s});
-    }
-    std::sort(keyed.begin(), keyed.end());
-    std::vector<std::string> out;
-    for (auto& [key, s] : keyed) out.push_back(std::move(s));
-    return out;
-}
-
-Region WholeDevice(const Device& d) { return Region{0, 0, d.columns - 1, d.rows - 1}; }
 
 bool ReadFile(const std::string& file, std::string& text) {
     std::ifstream in(file, std::ios::binary);
@@ -141,7 +121,8 @@ public:
         const std::string file = s1.c_str(), formWord = s2.c_str(), mode = s3.c_str();
         const auto form = FormFromWord(formWord);
         if (!form) return Fail(message, "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
-        if (mode != "replace" && mode != "merge") return Fail(message, "unknown mode '" + mode + "': use replace or merge");
+        if (mode != "replace" && mode != "merge")
+            return Fail(message, "unknown mode '" + mode + "': use replace or merge");
         FloorplanConstraints read;
         std::string error;
         if (!Load(*form, file, read, error)) return Fail(message, error);
@@ -176,11 +157,14 @@ public:
             return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(stripes) + ", not '" +
                                      std::string(s5.c_str()) + "'");
         if (!WholeNumber(s7.c_str(), 0, 1000000, sso))
-            return Fail(message, "the sso limit must be a whole number of at least 0, not '" + std::string(s7.c_str()) + "'");
+            return Fail(message,
+                        "the sso limit must be a whole number of at least 0, not '" + std::string(s7.c_str()) + "'");
         if (!WholeNumber(s8.c_str(), 1, 1000000, capacity))
-            return Fail(message, "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
+            return Fail(message,
+                        "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
         if (!WholeNumber(s9.c_str(), 0, 1000000, clocks))
-            return Fail(message, "the clock limit must be a whole number of at least 0, not '" + std::string(s9.c_str()) + "'");
+            return Fail(message,
+                        "the clock limit must be a whole number of at least 0, not '" + std::string(s9.c_str()) + "'");
         Device d;
         d.name = device;
         d.columns = columns;
@@ -191,8 +175,10 @@ public:
             b.name = "BANK" + std::to_string(i);
             const int first = static_cast<int>(static_cast<long long>(i) * stripes / banks);
             const int last = static_cast<int>(static_cast<long long>(i + 1) * stripes / banks) - 1;
-            if (layout == "columns") b.x0 = first, b.x1 = last, b.y0 = 0, b.y1 = rows - 1;
-            else b.x0 = 0, b.x1 = columns - 1, b.y0 = first, b.y1 = last;
+            if (layout == "columns")
+                b.x0 = first, b.x1 = last, b.y0 = 0, b.y1 = rows - 1;
+            else
+                b.x0 = 0, b.x1 = columns - 1, b.y0 = first, b.y1 = last;
             b.ssoLimit = sso;
             d.banks.push_back(std::move(b));
         }
@@ -226,7 +212,8 @@ public:
         return Answer(NewText(file), result, message);
     }
 
-    RESULT import(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result, Msg& message) override {
+    RESULT import(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result,
+                  Msg& message) override {
         auto state = m_state.lock();
         if (!state) return Gone(message);
         FloorplanData* plan = Ready(*state, message);
@@ -260,7 +247,8 @@ public:
         return 1;
     }
 
-    RESULT export_(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result, Msg& message) override {
+    RESULT export_(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result,
+                   Msg& message) override {
         auto state = m_state.lock();
         if (!state) return Gone(message);
         FloorplanData* plan = Ready(*state, message);
@@ -292,7 +280,8 @@ public:
         if (names.empty()) return Fail(message, "block " + Quote(name) + " needs at least one cell");
         const Design& design = *state->CurrentDesign();
         FloorplanConstraints changed = plan->constraints;
-        auto it = std::find_if(changed.blocks.begin(), changed.blocks.end(), [&](const Block& b) { return b.name == name; });
+        auto it =
+            std::find_if(changed.blocks.begin(), changed.blocks.end(), [&](const Block& b) { return b.name == name; });
         if (it == changed.blocks.end()) {
             changed.blocks.push_back(Block{});
             it = std::prev(changed.blocks.end());
@@ -332,7 +321,7 @@ public:
         FloorplanData* plan = Ready(*state, message);
         if (!plan) return 0;
         DictBuilder d;
-        for (const std::string& key : kProperties) d.Add(key, Property(*state, *plan, key));
+        for (const std::string& key : kFloorplanProperties) d.Add(key, FloorplanProperty(*state, *plan, key));
         return Answer(d.Take(), result, message);
     }
 
@@ -341,10 +330,11 @@ public:
         if (!state) return Gone(message);
         const std::string key = name.c_str();
         if (key == "open") return Answer(NewBool(Plan(*state).open), result, message);
-        if (std::find(kProperties.begin(), kProperties.end(), key) == kProperties.end()) return Unknown(key, message);
+        if (std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) == kFloorplanProperties.end())
+            return Unknown(key, message);
         FloorplanData* plan = Ready(*state, message);
         if (!plan) return 0;
-        return Answer(Property(*state, *plan, key), result, message);
+        return Answer(FloorplanProperty(*state, *plan, key), result, message);
     }
 
     RESULT set(const Str& name, const Str& value, Out& result, Msg& message) override {
@@ -352,7 +342,8 @@ public:
         if (!state) return Gone(message);
         const std::string key = name.c_str(), text = value.c_str();
         if (std::find(kWritable.begin(), kWritable.end(), key) == kWritable.end()) {
-            if (key == "open" || std::find(kProperties.begin(), kProperties.end(), key) != kProperties.end())
+            if (key == "open" ||
+                std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) != kFloorplanProperties.end())
                 return Fail(message, "the floorplan setting '" + key + "' is read-only");
             return Unknown(key, message);
         }
@@ -381,13 +372,14 @@ public:
             for (std::size_t i = 0; i < words.size(); i += 2) {
                 auto bank = std::find_if(changed.device.banks.begin(), changed.device.banks.end(),
                                          [&](const Bank& b) { return b.name == words[i]; });
-                if (bank == changed.device.banks.end()) return Fail(message, Quote(words[i]) + " is no bank of the device");
+                if (bank == changed.device.banks.end())
+                    return Fail(message, Quote(words[i]) + " is no bank of the device");
                 if (!WholeNumber(words[i + 1], 0, 1000000, bank->ssoLimit))
                     return Fail(message, "the sso limit of " + Quote(words[i]) +
                                              " must be a whole number of at least 0, not '" + words[i + 1] + "'");
             }
         }
-        if (!Answer(Property(*state, changed, key), result, message)) return 0;
+        if (!Answer(FloorplanProperty(*state, changed, key), result, message)) return 0;
         changed.modified = true;
         *plan = std::move(changed);
         return 1;
@@ -469,9 +461,13 @@ public:
         return AnswerBlocks(*plan, std::move(changed), names, result, message);
     }
 
-    RESULT prohibit(const Prop& sites, Out& result, Msg& message) override { return SwitchSites(sites, true, result, message); }
+    RESULT prohibit(const Prop& sites, Out& result, Msg& message) override {
+        return SwitchSites(sites, true, result, message);
+    }
 
-    RESULT allow(const Prop& sites, Out& result, Msg& message) override { return SwitchSites(sites, false, result, message); }
+    RESULT allow(const Prop& sites, Out& result, Msg& message) override {
+        return SwitchSites(sites, false, result, message);
+    }
 
     RESULT drc(Out& result, Msg& message) override {
         auto state = m_state.lock();
@@ -542,7 +538,8 @@ public:
         if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -100000, 100000, dx) ||
                                 !WholeNumber(offset[1], -100000, 100000, dy)))
             return Fail(message, "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
-        if (mode == "swap" && (dx != 0 || dy != 0)) return Fail(message, "swap moves no pin by an offset: give \"0 0\"");
+        if (mode == "swap" && (dx != 0 || dy != 0))
+            return Fail(message, "swap moves no pin by an offset: give \"0 0\"");
         const Design& design = *state->CurrentDesign();
         std::set<std::string> seen;
         for (const std::string& p : from) seen.insert(p);
@@ -554,10 +551,12 @@ public:
             for (const std::string* p : {&from[i], &to[i]})
                 if (!design.FindPort(*p)) return Fail(message, Quote(*p) + " is no port of the design");
             const auto source = plan->constraints.ports.find(from[i]);
-            if (source == plan->constraints.ports.end()) return Fail(message, "port " + Quote(from[i]) + " is not placed");
+            if (source == plan->constraints.ports.end())
+                return Fail(message, "port " + Quote(from[i]) + " is not placed");
             if (mode == "swap") {
                 const auto target = plan->constraints.ports.find(to[i]);
-                if (target == plan->constraints.ports.end()) return Fail(message, "port " + Quote(to[i]) + " is not placed");
+                if (target == plan->constraints.ports.end())
+                    return Fail(message, "port " + Quote(to[i]) + " is not placed");
                 sites[to[i]] = source->second;
                 sites[from[i]] = target->second;
                 continue;
@@ -565,15 +564,16 @@ public:
             int x = 0, y = 0;
             ParseSiteName(source->second, x, y);
             if (!plan->device.OnDevice(x + dx, y + dy))
-                return Fail(message, "port " + Quote(to[i]) + " would leave the device: " + source->second + " moved by " +
-                                         std::to_string(dx) + " " + std::to_string(dy));
+                return Fail(message, "port " + Quote(to[i]) + " would leave the device: " + source->second +
+                                         " moved by " + std::to_string(dx) + " " + std::to_string(dy));
             sites[to[i]] = Device::SiteName(x + dx, y + dy);
         }
         std::map<std::string, std::string> holder;  // site -> port
         for (const auto& [port, site] : sites) {
             auto [it, fresh] = holder.emplace(site, port);
             if (!fresh)
-                return Fail(message, "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
+                return Fail(message,
+                            "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
             const auto before = plan->constraints.ports.find(port);
             const bool changed = before == plan->constraints.ports.end() || before->second != site;
             if (changed && plan->constraints.prohibited.count(site))
@@ -600,11 +600,12 @@ public:
             if (!block) return Fail(message, "no block named " + Quote(b));
             const auto region = RegionOf(*block);
             if (!region) return Fail(message, "block " + Quote(b) + " has no region to show");
-            view = Clamp(*region, plan->device);
+            view = ClampToDevice(*region, plan->device);
         } else {
             const auto p = plan->device.ParseSite(a), q = plan->device.ParseSite(b);
             if (!p || !q)
-                return Fail(message, "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
+                return Fail(message,
+                            "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
             view = Region{std::min(p->x, q->x), std::min(p->y, q->y), std::max(p->x, q->x), std::max(p->y, q->y)};
         }
         if (!Answer(ViewValue(*plan, view), result, message)) return 0;
@@ -618,7 +619,7 @@ public:
         FloorplanData* plan = Ready(*state, message);
         if (!plan) return 0;
         // The device may have changed under the view; what no longer lies on it is dropped.
-        Region view = Clamp(plan->view, plan->device);
+        Region view = ClampToDevice(plan->view, plan->device);
         if (!Answer(ViewValue(*plan, view), result, message)) return 0;
         plan->view = view;
         return 1;
@@ -674,7 +675,7 @@ private:
 
     RESULT Install(ToolState& state, FloorplanData fresh, Out& result, Msg& message) {
         DictBuilder d;
-        for (const std::string& key : kProperties) d.Add(key, Property(state, fresh, key));
+        for (const std::string& key : kFloorplanProperties) d.Add(key, FloorplanProperty(state, fresh, key));
         if (!Answer(d.Take(), result, message)) return 0;
         Plan(state) = std::move(fresh);
         return 1;
@@ -688,7 +689,8 @@ private:
         ProjectComponent* project = state.Current();
         Design& design = *project->GetDesign();
         for (const Block& b : plan->constraints.blocks)
-            if (auto r = RegionOf(b); r && !(plan->device.OnDevice(r->x0, r->y0) && plan->device.OnDevice(r->x1, r->y1)))
+            if (auto r = RegionOf(b);
+                r && !(plan->device.OnDevice(r->x0, r->y0) && plan->device.OnDevice(r->x1, r->y1)))
                 return Fail(message, "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
                                          RegionText(*r) + ", which reaches beyond the device") != 0;
         Design before = design;
@@ -703,10 +705,14 @@ private:
             moved = moved || site != p.site;
             p.site = site;
         }
-        if (plan->name != design.name) design.properties[kNameKey] = plan->name;
-        else design.properties.erase(kNameKey);
-        if (plan->clockLimit > 0) design.properties[kClockLimitKey] = std::to_string(plan->clockLimit);
-        else design.properties.erase(kClockLimitKey);
+        if (plan->name != design.name)
+            design.properties[kNameKey] = plan->name;
+        else
+            design.properties.erase(kNameKey);
+        if (plan->clockLimit > 0)
+            design.properties[kClockLimitKey] = std::to_string(plan->clockLimit);
+        else
+            design.properties.erase(kClockLimitKey);
         std::string problem = design.Index();
         Port_String written;
         if (problem.empty() && project->Sync(written) != 1) problem = written.c_str();
@@ -735,7 +741,8 @@ private:
     }
 
     static RESULT Unknown(const std::string& key, Msg& message) {
-        return Fail(message, "no floorplan setting '" + key + "'; the settings are: open, " + Join(kProperties));
+        return Fail(message,
+                    "no floorplan setting '" + key + "'; the settings are: open, " + Join(kFloorplanProperties));
     }
 
     static const Block* FindBlock(const FloorplanData& plan, const std::string& name) {
@@ -744,13 +751,8 @@ private:
         return nullptr;
     }
 
-    static std::vector<std::string> BlockList(const FloorplanConstraints& c) {
-        std::vector<std::string> names;
-        for (const Block& b : c.blocks) names.push_back(b.name);
-        return names;
-    }
-
-    static bool BlockNames(const FloorplanData& plan, const Prop& value, std::vector<std::string>& names, Msg& message) {
+    static bool BlockNames(const FloorplanData& plan, const Prop& value, std::vector<std::string>& names,
+                           Msg& message) {
         if (!WordsOf(value, names)) return Fail(message, "the blocks are no proper list") != 0;
         if (names.empty()) return Fail(message, "no block given") != 0;
         for (const std::string& n : names)
@@ -785,77 +787,6 @@ private:
         return 1;
     }
 
-    static Tcl_Obj* BlockProperty(const FloorplanData& plan, const Block& b, const std::string& key) {
-        const auto region = RegionOf(b);
-        if (key == "name") return NewText(b.name);
-        if (key == "cells") return NewList(b.cells);
-        if (key == "size") return NewInt(static_cast<long long>(b.cells.size()));
-        if (key == "region") return NewText(region ? RegionText(*region) : std::string());
-        if (key == "capacity") {
-            const auto capacity = CapacityOf(b, plan);
-            return capacity ? NewInt(*capacity) : NewText("");
-        }
-        if (key == "sites") return NewInt(region ? region->Sites() : 0);
-        DictBuilder d;
-        for (const auto& [k, v] : b.constraints) d.Add(k, v);
-        return d.Take();
-    }
-
-    static Tcl_Obj* BlockValue(const FloorplanData& plan, const Block& b) {
-        DictBuilder d;
-        for (const std::string& key : kBlockProperties)
-            if (key != "name") d.Add(key, BlockProperty(plan, b, key));
-        return d.Take();
-    }
-
-    static Region Clamp(const Region& r, const Device& d) {
-        Region out{std::max(r.x0, 0), std::max(r.y0, 0), std::min(r.x1, d.columns - 1), std::min(r.y1, d.rows - 1)};
-        if (out.x0 > out.x1 || out.y0 > out.y1) return WholeDevice(d);
-        return out;
-    }
-
-    static Tcl_Obj* ViewValue(const FloorplanData& plan, const Region& view) {
-        std::vector<std::string> visible;
-        for (const Block& b : plan.constraints.blocks)
-            if (auto r = RegionOf(b); r && r->Overlaps(view)) visible.push_back(b.name);
-        return DictBuilder()
-            .Add("x0", view.x0)
-            .Add("y0", view.y0)
-            .Add("x1", view.x1)
-            .Add("y1", view.y1)
-            .Add("region", RegionText(view))
-            .Add("blocks", NewList(visible))
-            .Take();
-    }
-
-    static Tcl_Obj* Property(const ToolState& state, const FloorplanData& plan, const std::string& key) {
-        const Device& d = plan.device;
-        if (key == "name") return NewText(plan.name);
-        if (key == "design") {
-            const Design* design = state.CurrentDesign();
-            return NewText(design ? design->name : std::string());
-        }
-        if (key == "device") return NewText(d.name);
-        if (key == "columns") return NewInt(d.columns);
-        if (key == "rows") return NewInt(d.rows);
-        if (key == "site_capacity") return NewInt(d.siteCapacity);
-        if (key == "banks") {
-            std::vector<std::string> names;
-            for (const Bank& b : d.banks) names.push_back(b.name);
-            return NewList(names);
-        }
-        if (key == "sso_limit") {
-            DictBuilder limits;
-            for (const Bank& b : d.banks) limits.Add(b.name, b.ssoLimit);
-            return limits.Take();
-        }
-        if (key == "clock_limit") return NewInt(plan.clockLimit);
-        if (key == "blocks") return NewList(BlockList(plan.constraints));
-        if (key == "prohibited") return NewList(SiteOrder(plan.constraints.prohibited));
-        if (key == "modified") return NewBool(plan.modified);
-        return ViewValue(plan, plan.view);
-    }
-
     RESULT SwitchSites(const Prop& sites, bool prohibit, Out& result, Msg& message) {
         auto state = m_state.lock();
         if (!state) return Gone(message);
@@ -874,12 +805,14 @@ private:
                 return Fail(message, Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
             if (!range) r = Region{x, y, x, y};
             if (!plan->device.OnDevice(r.x0, r.y0) || !plan->device.OnDevice(r.x1, r.y1))
-                return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan->device.columns) + " x " +
-                                         std::to_string(plan->device.rows) + " sites)");
+                return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan->device.columns) +
+                                         " x " + std::to_string(plan->device.rows) + " sites)");
             for (int yy = r.y0; yy <= r.y1; ++yy)
                 for (int xx = r.x0; xx <= r.x1; ++xx) {
-                    if (prohibit) changed.insert(Device::SiteName(xx, yy));
-                    else changed.erase(Device::SiteName(xx, yy));
+                    if (prohibit)
+                        changed.insert(Device::SiteName(xx, yy));
+                    else
+                        changed.erase(Device::SiteName(xx, yy));
                 }
         }
         if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;

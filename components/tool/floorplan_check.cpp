@@ -30,7 +30,8 @@ std::string CheckBlockConstraint(const std::string& name, const std::string& val
     if (name == "capacity") {
         char* end = nullptr;
         const long long n = std::strtoll(value.c_str(), &end, 10);
-        if (value.empty() || *end != '\0' || n < 0) return "a capacity must be a whole number of at least 0, not '" + value + "'";
+        if (value.empty() || *end != '\0' || n < 0)
+            return "a capacity must be a whole number of at least 0, not '" + value + "'";
         return {};
     }
     if (name == "comment") return {};
@@ -43,7 +44,8 @@ std::string CheckConstraints(const Design& design, const Device& device, const F
         if (b.name.empty() || b.name.find_first_of(" \t\n") != std::string::npos)
             return "a block name must be one word, not '" + b.name + "'";
         for (const std::string& cell : b.cells) {
-            if (!design.FindCell(cell)) return "block " + Quote(b.name) + " holds " + Quote(cell) + ", which is no cell";
+            if (!design.FindCell(cell))
+                return "block " + Quote(b.name) + " holds " + Quote(cell) + ", which is no cell";
             auto [it, fresh] = owner.emplace(cell, b.name);
             if (!fresh && it->second != b.name)
                 return "cell " + Quote(cell) + " is in the blocks " + Quote(it->second) + " and " + Quote(b.name);
@@ -56,7 +58,8 @@ std::string CheckConstraints(const Design& design, const Device& device, const F
         if (!device.ParseSite(site)) return "the prohibited site " + Quote(site) + " is no site of the device";
     for (const auto& [port, site] : c.ports) {
         if (!design.FindPort(port)) return Quote(port) + " is no port of the design";
-        if (!device.ParseSite(site)) return "port " + Quote(port) + " is placed on " + Quote(site) + ", which is no site of the device";
+        if (!device.ParseSite(site))
+            return "port " + Quote(port) + " is placed on " + Quote(site) + ", which is no site of the device";
     }
     return {};
 }
@@ -85,37 +88,42 @@ std::vector<DrcFinding> RunDrc(const Design& design, const FloorplanData& plan) 
 
     for (const Block& b : blocks)
         if (auto r = RegionOf(b); r && !Inside(device, *r))
-            out.push_back({"out_of_device", {b.name},
+            out.push_back({"out_of_device",
+                           {b.name},
                            "block " + Quote(b.name) + " has the region " + RegionText(*r) +
                                ", which reaches beyond the device (" + size + ")"});
     for (const Cell& c : design.cells)
         if (!c.site.empty() && !onDevice(c.site))
-            out.push_back({"out_of_device", {c.name, c.site},
-                           "cell " + Quote(c.name) + " is placed on " + c.site + ", which is not on the device (" +
-                               size + ")"});
+            out.push_back(
+                {"out_of_device",
+                 {c.name, c.site},
+                 "cell " + Quote(c.name) + " is placed on " + c.site + ", which is not on the device (" + size + ")"});
     for (const auto& [port, site] : plan.constraints.ports)
         if (!onDevice(site))
-            out.push_back({"out_of_device", {port, site},
-                           "port " + Quote(port) + " is placed on " + site + ", which is not on the device (" + size +
-                               ")"});
+            out.push_back(
+                {"out_of_device",
+                 {port, site},
+                 "port " + Quote(port) + " is placed on " + site + ", which is not on the device (" + size + ")"});
 
     for (std::size_t i = 0; i < blocks.size(); ++i)
         for (std::size_t j = i + 1; j < blocks.size(); ++j) {
             const auto a = RegionOf(blocks[i]), b = RegionOf(blocks[j]);
             if (a && b && a->Overlaps(*b))
-                out.push_back({"overlap", {blocks[i].name, blocks[j].name},
+                out.push_back({"overlap",
+                               {blocks[i].name, blocks[j].name},
                                "the regions of blocks " + Quote(blocks[i].name) + " (" + RegionText(*a) + ") and " +
                                    Quote(blocks[j].name) + " (" + RegionText(*b) + ") overlap"});
         }
 
     for (const Cell& c : design.cells)
         if (plan.constraints.prohibited.count(c.site))
-            out.push_back({"prohibited_site", {c.name, c.site},
+            out.push_back({"prohibited_site",
+                           {c.name, c.site},
                            "cell " + Quote(c.name) + " is placed on the prohibited site " + c.site});
     for (const auto& [port, site] : plan.constraints.ports)
         if (plan.constraints.prohibited.count(site))
-            out.push_back({"prohibited_site", {port, site},
-                           "port " + Quote(port) + " is placed on the prohibited site " + site});
+            out.push_back(
+                {"prohibited_site", {port, site}, "port " + Quote(port) + " is placed on the prohibited site " + site});
 
     for (const Block& b : blocks) {
         const auto r = RegionOf(b);
@@ -124,7 +132,8 @@ std::vector<DrcFinding> RunDrc(const Design& design, const FloorplanData& plan) 
             const Cell* c = design.FindCell(name);
             int x = 0, y = 0;
             if (c && ParseSiteName(c->site, x, y) && !r->Contains(x, y))
-                out.push_back({"outside_region", {name, b.name},
+                out.push_back({"outside_region",
+                               {name, b.name},
                                "cell " + Quote(name) + " of block " + Quote(b.name) + " is placed on " + c->site +
                                    ", outside the region " + RegionText(*r)});
         }
@@ -134,7 +143,8 @@ std::vector<DrcFinding> RunDrc(const Design& design, const FloorplanData& plan) 
         const auto capacity = CapacityOf(b, plan);
         const auto held = static_cast<long long>(b.cells.size());
         if (capacity && held > *capacity)
-            out.push_back({"capacity", {b.name},
+            out.push_back({"capacity",
+                           {b.name},
                            "block " + Quote(b.name) + " holds " + std::to_string(held) + " cells but has room for " +
                                std::to_string(*capacity)});
     }

@@ -52,8 +52,8 @@ bool Number(std::string_view digits, int& out) {
 
 bool ParseSiteName(std::string_view name, int& x, int& y) {
     const auto ypos = name.find('Y');
-    return name.size() >= 4 && name[0] == 'X' && ypos != std::string_view::npos && Number(name.substr(1, ypos - 1), x) &&
-           Number(name.substr(ypos + 1), y) && x >= 0 && y >= 0;
+    return name.size() >= 4 && name[0] == 'X' && ypos != std::string_view::npos &&
+           Number(name.substr(1, ypos - 1), x) && Number(name.substr(ypos + 1), y) && x >= 0 && y >= 0;
 }
 
 bool ParseRegion(const std::string& text, Region& region, std::string& error) {
@@ -84,7 +84,8 @@ bool ParseRegion(const std::string& text, Region& region, std::string& error) {
 std::string RegionText(const Region& r) {
     // Corners off the device's lower edge cannot be named as sites; those regions read as numbers.
     if (r.x0 < 0 || r.y0 < 0)
-        return std::to_string(r.x0) + " " + std::to_string(r.y0) + " " + std::to_string(r.x1) + " " + std::to_string(r.y1);
+        return std::to_string(r.x0) + " " + std::to_string(r.y0) + " " + std::to_string(r.x1) + " " +
+               std::to_string(r.y1);
     return Device::SiteName(r.x0, r.y0) + ":" + Device::SiteName(r.x1, r.y1);
 }
 
@@ -103,7 +104,8 @@ void SetRegion(Block& b, const std::optional<Region>& r) {
 
 void MergeConstraints(FloorplanConstraints& base, const FloorplanConstraints& extra) {
     for (const Block& b : extra.blocks) {
-        auto it = std::find_if(base.blocks.begin(), base.blocks.end(), [&b](const Block& o) { return o.name == b.name; });
+        auto it =
+            std::find_if(base.blocks.begin(), base.blocks.end(), [&b](const Block& o) { return o.name == b.name; });
         if (it == base.blocks.end()) {
             base.blocks.push_back(b);
             continue;
@@ -119,10 +121,14 @@ void MergeConstraints(FloorplanConstraints& base, const FloorplanConstraints& ex
 
 const char* FormWord(ConstraintForm form) noexcept {
     switch (form) {
-        case ConstraintForm::Ucf: return "ucf";
-        case ConstraintForm::Csv: return "csv";
-        case ConstraintForm::Vhdl: return "vhdl";
-        case ConstraintForm::Vlog: return "vlog";
+        case ConstraintForm::Ucf:
+            return "ucf";
+        case ConstraintForm::Csv:
+            return "csv";
+        case ConstraintForm::Vhdl:
+            return "vhdl";
+        case ConstraintForm::Vlog:
+            return "vlog";
     }
     return "";
 }
@@ -156,9 +162,14 @@ std::vector<Entry> Entries(const FloorplanConstraints& c) {
 // Adds one entry; the first entry of a block makes it.
 bool Apply(FloorplanConstraints& c, const Entry& e, std::string& error) {
     switch (e.what) {
-        case Entry::Prohibit: c.prohibited.insert(e.name); return true;
-        case Entry::Port: c.ports[e.name] = e.value; return true;
-        case Entry::BlockKey: break;
+        case Entry::Prohibit:
+            c.prohibited.insert(e.name);
+            return true;
+        case Entry::Port:
+            c.ports[e.name] = e.value;
+            return true;
+        case Entry::BlockKey:
+            break;
     }
     if (e.name.empty()) {
         error = "a block needs a name";
@@ -346,10 +357,14 @@ bool CsvFields(std::string_view line, std::vector<std::string>& fields) {
 bool ParseCsvLine(std::string_view line, Entry& e) {
     std::vector<std::string> f;
     if (!CsvFields(line, f) || f.size() != 4) return false;
-    if (f[0] == "block") e.what = Entry::BlockKey;
-    else if (f[0] == "prohibit") e.what = Entry::Prohibit;
-    else if (f[0] == "port" && f[2] == "loc") e.what = Entry::Port;
-    else return false;
+    if (f[0] == "block")
+        e.what = Entry::BlockKey;
+    else if (f[0] == "prohibit")
+        e.what = Entry::Prohibit;
+    else if (f[0] == "port" && f[2] == "loc")
+        e.what = Entry::Port;
+    else
+        return false;
     e.name = f[1];
     e.key = f[2];
     e.value = f[3];
@@ -390,10 +405,14 @@ bool ParseVhdlLine(std::string_view line, Entry& e, bool& skip) {
         return false;
     e.name = name;
     e.key = key;
-    if (entityClass == "label" && key != "prohibit" && key != "loc") e.what = Entry::BlockKey;
-    else if (entityClass == "literal" && key == "prohibit") e.what = Entry::Prohibit;
-    else if (entityClass == "signal" && key == "loc") e.what = Entry::Port;
-    else return false;
+    if (entityClass == "label" && key != "prohibit" && key != "loc")
+        e.what = Entry::BlockKey;
+    else if (entityClass == "literal" && key == "prohibit")
+        e.what = Entry::Prohibit;
+    else if (entityClass == "signal" && key == "loc")
+        e.what = Entry::Port;
+    else
+        return false;
     return true;
 }
 
@@ -431,9 +450,12 @@ bool ParseVlogLine(std::string_view line, std::vector<Entry>& entries) {
     if (!s.Punct("*)") || !s.Word(kind) || !s.Word(name) || !s.Punct(";") || !s.AtEnd()) return false;
     for (const auto& [key, value] : attributes) {
         Entry e{Entry::BlockKey, name, key, value};
-        if (kind == "site" && key == "prohibit") e.what = Entry::Prohibit;
-        else if (kind == "port" && key == "loc") e.what = Entry::Port;
-        else if (kind != "block" || key == "prohibit" || key == "loc") return false;
+        if (kind == "site" && key == "prohibit")
+            e.what = Entry::Prohibit;
+        else if (kind == "port" && key == "loc")
+            e.what = Entry::Port;
+        else if (kind != "block" || key == "prohibit" || key == "loc")
+            return false;
         entries.push_back(std::move(e));
     }
     return true;
@@ -443,9 +465,12 @@ std::string_view StripComment(std::string_view line, std::string_view marker) {
     // A marker inside a quoted value is part of the value.
     bool quoted = false;
     for (std::size_t i = 0; i < line.size(); ++i) {
-        if (line[i] == '\\' && quoted) ++i;
-        else if (line[i] == '"') quoted = !quoted;
-        else if (!quoted && line.substr(i, marker.size()) == marker) return line.substr(0, i);
+        if (line[i] == '\\' && quoted)
+            ++i;
+        else if (line[i] == '"')
+            quoted = !quoted;
+        else if (!quoted && line.substr(i, marker.size()) == marker)
+            return line.substr(0, i);
     }
     return line;
 }
@@ -454,10 +479,14 @@ std::string_view StripComment(std::string_view line, std::string_view marker) {
 
 std::string FormatConstraints(ConstraintForm form, const FloorplanConstraints& c, const std::string& design) {
     switch (form) {
-        case ConstraintForm::Ucf: return FormatUcf(Entries(c), design);
-        case ConstraintForm::Csv: return FormatCsv(Entries(c));
-        case ConstraintForm::Vhdl: return FormatVhdl(Entries(c), design);
-        case ConstraintForm::Vlog: return FormatVlog(c, design);
+        case ConstraintForm::Ucf:
+            return FormatUcf(Entries(c), design);
+        case ConstraintForm::Csv:
+            return FormatCsv(Entries(c));
+        case ConstraintForm::Vhdl:
+            return FormatVhdl(Entries(c), design);
+        case ConstraintForm::Vlog:
+            return FormatVlog(c, design);
     }
     return {};
 }
@@ -490,9 +519,15 @@ bool ParseConstraints(ConstraintForm form, const std::string& text, FloorplanCon
         std::vector<Entry> entries(1);
         bool ok = false, skip = false;
         switch (form) {
-            case ConstraintForm::Ucf: ok = ParseUcfLine(line, entries[0]); break;
-            case ConstraintForm::Csv: ok = ParseCsvLine(line, entries[0]); break;
-            case ConstraintForm::Vhdl: ok = ParseVhdlLine(line, entries[0], skip); break;
+            case ConstraintForm::Ucf:
+                ok = ParseUcfLine(line, entries[0]);
+                break;
+            case ConstraintForm::Csv:
+                ok = ParseCsvLine(line, entries[0]);
+                break;
+            case ConstraintForm::Vhdl:
+                ok = ParseVhdlLine(line, entries[0], skip);
+                break;
             case ConstraintForm::Vlog:
                 entries.clear();
                 ok = ParseVlogLine(line, entries);

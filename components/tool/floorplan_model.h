@@ -43,7 +43,7 @@ struct FloorplanConstraints {
 
 struct FloorplanData {
     bool open = false;
-    uint64_t epoch = 0;     // the design epoch the copy belongs to
+    uint64_t epoch = 0;  // the design epoch the copy belongs to
     std::string name;
     Device device;
     FloorplanConstraints constraints;  // ports holds every placed port of the design

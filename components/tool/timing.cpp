@@ -40,32 +40,25 @@ using Out = UtilI::MITclProperty;
 using Msg = Port_String;
 using CommonI::RESULT;
 
-const std::vector<std::string> kPathFields{"startpoint", "endpoint", "clock", "arrival", "required", "slack", "points"};
-
-struct Descriptor {
+// The fields of a reported path, in the order a path's dict has them.
+struct PathField {
     const char* name;
-    const char* type;
-    bool writable;
-    const char* description;
+    Tcl_Obj* (*value)(const TimingPath&);
 };
-
-constexpr Descriptor kSettings[] = {
-    {"name", "string", true, "the display name of the analysis"},
-    {"description", "string", true, "free text about the analysis"},
-    {"status", "string", false, "new before the first run, done after it, stale once the design changed"},
-    {"worst_slack", "double", false, "the smallest slack of the last run, empty when no path was timed"},
-    {"total_negative_slack", "double", false, "the sum of the negative worst slacks of the endpoints"},
-    {"endpoint_count", "int", false, "endpoints timed by the last run"},
-    {"failing", "int", false, "endpoints with negative slack in the last run"},
-    {"unconstrained", "int", false, "endpoints reached but timed by no clock"},
-    {"paths", "list", false, "the reported paths of the last run, worst first"},
-    {"high_fanout", "list", false, "the nets found by the fanout query of the last run"},
-    {"constraints", "dict", false, "the constraints: name -> value and enabled"},
-    {"cpt", "dict", false, "the items left out of path tracing, by kind"},
-    {"endpoints", "dict", false, "where paths may start (from) and end (to)"},
-    {"queries", "dict", false, "what a run reports"},
-    {"filters", "dict", false, "which computed paths are reported"},
+constexpr PathField kPathFieldTable[] = {
+    {"startpoint", [](const TimingPath& p) { return NewText(p.startpoint); }},
+    {"endpoint", [](const TimingPath& p) { return NewText(p.endpoint); }},
+    {"clock", [](const TimingPath& p) { return NewText(p.clock); }},
+    {"arrival", [](const TimingPath& p) { return NewDouble(p.arrival); }},
+    {"required", [](const TimingPath& p) { return NewDouble(p.required); }},
+    {"slack", [](const TimingPath& p) { return NewDouble(p.slack); }},
+    {"points", [](const TimingPath& p) { return NewList(p.points); }},
 };
+const std::vector<std::string> kPathFields = [] {
+    std::vector<std::string> names;
+    for (const PathField& f : kPathFieldTable) names.push_back(f.name);
+    return names;
+}();
 
 bool IsNumber(const std::string& text, double& value) {
     if (text.empty()) return false;
@@ -129,15 +122,9 @@ std::vector<std::string> Fields(const TimingSettings& s) {
 
 Tcl_Obj* PathValue(const TimingPath& p, const std::vector<std::string>& fields) {
     DictBuilder d;
-    for (const std::string& f : fields) {
-        if (f == "startpoint") d.Add(f, p.startpoint);
-        else if (f == "endpoint") d.Add(f, p.endpoint);
-        else if (f == "clock") d.Add(f, p.clock);
-        else if (f == "arrival") d.Add(f, p.arrival);
-        else if (f == "required") d.Add(f, p.required);
-        else if (f == "slack") d.Add(f, p.slack);
-        else d.Add(f, NewList(p.points));
-    }
+    for (const std::string& f : fields)
+        for (const PathField& field : kPathFieldTable)
+            if (f == field.name) d.Add(f, field.value(p));
     return d.Take();
 }
 
@@ -156,6 +143,53 @@ Tcl_Obj* FanoutValue(const Analysis& a) {
         Tcl_ListObjAppendElement(nullptr, list, DictBuilder().Add("net", n.net).Add("fanout", n.fanout).Take());
     return list;
 }
+
+std::string Status(const ToolState& state, const Analysis& a) {
+    if (!a.result) return "new";
+    return a.result->epoch == state.designEpoch ? "done" : "stale";
+}
+
+// The settings and results of an analysis, as get, set and properties -descriptors know them.
+struct Descriptor {
+    const char* name;
+    const char* type;
+    bool writable;
+    const char* description;
+    Tcl_Obj* (*value)(const ToolState&, const Analysis&);
+};
+
+using State = const ToolState&;
+using An = const Analysis&;
+
+constexpr Descriptor kSettings[] = {
+    {"name", "string", true, "the display name of the analysis", [](State, An a) { return NewText(a.name); }},
+    {"description", "string", true, "free text about the analysis", [](State, An a) { return NewText(a.description); }},
+    {"status", "string", false, "new before the first run, done after it, stale once the design changed",
+     [](State s, An a) { return NewText(Status(s, a)); }},
+    {"worst_slack", "double", false, "the smallest slack of the last run, empty when no path was timed",
+     [](State, An a) { return a.result && a.result->worstSlack ? NewDouble(*a.result->worstSlack) : NewText(""); }},
+    {"total_negative_slack", "double", false, "the sum of the negative worst slacks of the endpoints",
+     [](State, An a) { return NewDouble(a.result ? a.result->totalNegativeSlack : 0.0); }},
+    {"endpoint_count", "int", false, "endpoints timed by the last run",
+     [](State, An a) { return NewInt(a.result ? a.result->endpoints : 0); }},
+    {"failing", "int", false, "endpoints with negative slack in the last run",
+     [](State, An a) { return NewInt(a.result ? a.result->failing : 0); }},
+    {"unconstrained", "int", false, "endpoints reached but timed by no clock",
+     [](State, An a) { return NewInt(a.result ? a.result->unconstrained : 0); }},
+    {"paths", "list", false, "the reported paths of the last run, worst first",
+     [](State, An a) { return PathsValue(a); }},
+    {"high_fanout", "list", false, "the nets found by the fanout query of the last run",
+     [](State, An a) { return FanoutValue(a); }},
+    {"constraints", "dict", false, "the constraints: name -> value and enabled",
+     [](State, An a) { return ConstraintsValue(a.settings); }},
+    {"cpt", "dict", false, "the items left out of path tracing, by kind",
+     [](State, An a) { return CptValue(a.settings); }},
+    {"endpoints", "dict", false, "where paths may start (from) and end (to)",
+     [](State, An a) { return EndpointsValue(a.settings); }},
+    {"queries", "dict", false, "what a run reports", [](State, An a) { return QueriesValue(a.settings); }},
+    {"filters", "dict", false, "which computed paths are reported",
+     [](State, An a) { return FiltersValue(a.settings); }},
+};
 
 std::string Number(double value) { return TclValue(NewDouble(value)).Text(); }
 
@@ -214,25 +248,9 @@ public:
         const Analysis* a = Find(Data(*state), analysis, message);
         if (!a) return 0;
         const std::string key = name.c_str();
-        const TimingResult* r = a->result ? &*a->result : nullptr;
-        Tcl_Obj* value = nullptr;
-        if (key == "name") value = NewText(a->name);
-        else if (key == "description") value = NewText(a->description);
-        else if (key == "status") value = NewText(Status(*state, *a));
-        else if (key == "worst_slack") value = r && r->worstSlack ? NewDouble(*r->worstSlack) : NewText("");
-        else if (key == "total_negative_slack") value = NewDouble(r ? r->totalNegativeSlack : 0.0);
-        else if (key == "endpoint_count") value = NewInt(r ? r->endpoints : 0);
-        else if (key == "failing") value = NewInt(r ? r->failing : 0);
-        else if (key == "unconstrained") value = NewInt(r ? r->unconstrained : 0);
-        else if (key == "paths") value = PathsValue(*a);
-        else if (key == "high_fanout") value = FanoutValue(*a);
-        else if (key == "constraints") value = ConstraintsValue(a->settings);
-        else if (key == "cpt") value = CptValue(a->settings);
-        else if (key == "endpoints") value = EndpointsValue(a->settings);
-        else if (key == "queries") value = QueriesValue(a->settings);
-        else if (key == "filters") value = FiltersValue(a->settings);
-        else return UnknownSetting(key, message);
-        return Answer(value, result, message);
+        for (const Descriptor& d : kSettings)
+            if (key == d.name) return Answer(d.value(*state, *a), result, message);
+        return UnknownSetting(key, message);
     }
 
     RESULT enable_cpt(const Str& analysis, const Str& kind, const List& items, Out& result, Msg& message) override {
@@ -313,7 +331,8 @@ public:
                 if (key == d.name) return Fail(message, "the setting '" + key + "' of a timing analysis is read-only");
             return UnknownSetting(key, message);
         }
-        if (key == "name" && text.empty()) return Fail(message, "the display name of a timing analysis cannot be empty");
+        if (key == "name" && text.empty())
+            return Fail(message, "the display name of a timing analysis cannot be empty");
         if (!Answer(NewText(text), result, message)) return 0;
         *target = text;
         return 1;
@@ -351,15 +370,16 @@ public:
             const IoPort* port = design->FindPort(item);
             const bool fits = (cell && cell->sequential) || (port && port->output == (k == "to"));
             if (!fits)
-                return Fail(message, "'" + item + "' is no " + (k == "from" ? "start" : "end") +
-                                         " point: use " + (k == "from" ? "input" : "output") +
-                                         " ports and sequential cells");
+                return Fail(message, "'" + item + "' is no " + (k == "from" ? "start" : "end") + " point: use " +
+                                         (k == "from" ? "input" : "output") + " ports and sequential cells");
         }
         if (items.empty() && s == "only")
             return Fail(message, "set_endpoints " + k + " only needs at least one endpoint");
         TimingSettings changed = a->settings;
-        if (items.empty()) changed.endpoints.erase(k);
-        else changed.endpoints[k] = TimingSettings::EndpointRule{s, items};
+        if (items.empty())
+            changed.endpoints.erase(k);
+        else
+            changed.endpoints[k] = TimingSettings::EndpointRule{s, items};
         return Commit(*a, std::move(changed), EndpointsValue, result, message);
     }
 
@@ -438,9 +458,9 @@ private:
         if (it != data.analyses.end()) return &it->second;
         std::vector<std::string> ids;
         for (const auto& [id, a] : data.analyses) ids.push_back(id);
-        Fail(message, "no timing analysis named '" + std::string(analysis.c_str()) + "'" +
-                          (ids.empty() ? std::string(": make one with timing new NAME")
-                                       : "; the analyses are: " + Join(ids)));
+        Fail(message,
+             "no timing analysis named '" + std::string(analysis.c_str()) + "'" +
+                 (ids.empty() ? std::string(": make one with timing new NAME") : "; the analyses are: " + Join(ids)));
         return nullptr;
     }
 
@@ -448,11 +468,6 @@ private:
         std::vector<std::string> names;
         for (const Descriptor& d : kSettings) names.push_back(d.name);
         return Fail(message, "no setting '" + key + "' in a timing analysis; the settings are: " + Join(names));
-    }
-
-    static std::string Status(const ToolState& state, const Analysis& a) {
-        if (!a.result) return "new";
-        return a.result->epoch == state.designEpoch ? "done" : "stale";
     }
 
     static Tcl_Obj* Settings(const ToolState& state, const Analysis& a) {
@@ -487,7 +502,8 @@ private:
         const bool numeric = IsNumber(value, number);
         if (type == "period") {
             if (!design) return kNoProject;
-            if (!hasObject || !design->FindClock(object)) return "the constraint period:CLOCK needs a clock of the design";
+            if (!hasObject || !design->FindClock(object))
+                return "the constraint period:CLOCK needs a clock of the design";
             if (!numeric || number <= 0) return "a clock period must be a positive number, not '" + value + "'";
             return {};
         }
@@ -509,7 +525,8 @@ private:
         }
         if (type == "reference_clock" && !hasObject) {
             if (!design) return kNoProject;
-            if (!design->FindClock(value)) return "the reference clock must be a clock of the design, not '" + value + "'";
+            if (!design->FindClock(value))
+                return "the reference clock must be a clock of the design, not '" + value + "'";
             return {};
         }
         return "unknown constraint '" + name +
@@ -553,8 +570,10 @@ private:
         for (const std::string& w : words) {
             const auto ref = design->Find(w);
             if (!ref || ref->kind != *objectKind) return Fail(message, "'" + w + "' is no " + k + " of the design");
-            if (enabled) set.erase(w);
-            else set.insert(w);
+            if (enabled)
+                set.erase(w);
+            else
+                set.insert(w);
         }
         if (set.empty()) changed.disabled.erase(k);
         return Commit(*a, std::move(changed), CptValue, result, message);

@@ -113,7 +113,8 @@ public:
             const Cell& c = design.cells[i];
             m_active[i] = !offCells.count(c.name) && !(c.sequential && offClocks.count(c.clock));
         }
-        for (std::size_t i = 0; i < design.ports.size(); ++i) m_active[cells + i] = !offPorts.count(design.ports[i].name);
+        for (std::size_t i = 0; i < design.ports.size(); ++i)
+            m_active[cells + i] = !offPorts.count(design.ports[i].name);
         m_offClocks = offClocks;
     }
 
@@ -186,7 +187,7 @@ private:
         std::vector<std::size_t> cycle(walk.begin() + static_cast<std::ptrdiff_t>(seen[at]), walk.end());
         std::reverse(cycle.begin(), cycle.end());
         const auto first = std::min_element(cycle.begin(), cycle.end(),
-                                             [this](std::size_t a, std::size_t b) { return Name(a) < Name(b); });
+                                            [this](std::size_t a, std::size_t b) { return Name(a) < Name(b); });
         std::rotate(cycle.begin(), first, cycle.end());
         std::vector<std::string> names;
         for (std::size_t n : cycle) names.push_back(Name(n));
@@ -219,8 +220,9 @@ bool PassesFilters(const TimingSettings& settings, const TimingPath& path) {
             if (kind == "through") {
                 for (const std::string& point : path.points) hit = hit || MatchesAny(point, filter.items);
             } else {
-                const std::string& name =
-                    kind == "startpoint" ? path.startpoint : kind == "endpoint" ? path.endpoint : path.clock;
+                const std::string& name = kind == "startpoint" ? path.startpoint
+                                          : kind == "endpoint" ? path.endpoint
+                                                               : path.clock;
                 hit = MatchesAny(name, filter.items);
             }
             keep = filter.mode == "include" ? hit : !hit;
@@ -291,8 +293,8 @@ bool RunTiming(const Design& design, const TimingSettings& settings, int pathLim
         std::fill(inArrival.begin(), inArrival.end(), kUnreached);
         std::fill(endArrival.begin(), endArrival.end(), kUnreached);
         std::fill(arrival.begin(), arrival.end(), kUnreached);
-        arrival[start] = graph.IsCell(start) ? graph.CellAt(start).delay
-                                             : portDelay(graph.Name(start), constraints.inputDelay);
+        arrival[start] =
+            graph.IsCell(start) ? graph.CellAt(start).delay : portDelay(graph.Name(start), constraints.inputDelay);
         auto spread = [&](std::size_t from) {
             for (const Edge& e : graph.Out(from)) {
                 const double at = arrival[from] + e.delay;

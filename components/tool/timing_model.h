@@ -76,14 +76,14 @@ struct FanoutNet {
 };
 
 struct TimingResult {
-    uint64_t epoch = 0;              // the design epoch the result was computed for
-    std::string design;              // the design's name
-    std::vector<TimingPath> paths;   // the reported paths, worst first
-    int endpoints = 0;               // endpoints reached by at least one path
-    int failing = 0;                 // endpoints with negative slack
-    int unconstrained = 0;           // endpoints reached but without a clock to time them
+    uint64_t epoch = 0;             // the design epoch the result was computed for
+    std::string design;             // the design's name
+    std::vector<TimingPath> paths;  // the reported paths, worst first
+    int endpoints = 0;              // endpoints reached by at least one path
+    int failing = 0;                // endpoints with negative slack
+    int unconstrained = 0;          // endpoints reached but without a clock to time them
     std::optional<double> worstSlack;
-    double totalNegativeSlack = 0;   // the sum of the negative worst slacks of the endpoints
+    double totalNegativeSlack = 0;  // the sum of the negative worst slacks of the endpoints
     std::vector<FanoutNet> highFanout;
 };
 
