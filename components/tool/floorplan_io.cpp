@@ -15,7 +15,8 @@
 //     prohibit,X1Y2,,
 //     port,p1,loc,X0Y1
 //
-// vhdl: attribute specifications, "--" starts a comment, attribute declarations are skipped. A block
+// vhdl: attribute statements ("attribute X of Y : CLASS is VALUE;"), "--" starts a comment,
+// attribute declarations are skipped. A block
 // is a label, a prohibited site a literal, a port a signal.
 //     attribute kel_cells of b1 : label is "u1 u2";
 //     attribute kel_region of b1 : label is "X0Y0:X3Y3";
@@ -390,7 +391,7 @@ std::string FormatVhdl(const std::vector<Entry>& entries, const std::string& des
     return out;
 }
 
-// False on a line that is no attribute specification; `skip` is set for a declaration.
+// False on a line that is no attribute statement; `skip` is set for an attribute declaration.
 bool ParseVhdlLine(std::string_view line, Entry& e, bool& skip) {
     Scanner s(line);
     std::string attribute, name, entityClass;

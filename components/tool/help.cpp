@@ -122,7 +122,7 @@ constexpr Usage kTiming[] = {
     {"delete", "timing delete ANALYSIS: removes an analysis"},
     {"delete_", "timing delete ANALYSIS: removes an analysis"},
     {"disable_constraints", "timing disable_constraints ANALYSIS CONSTRAINT...: leaves constraints out of the analysis"},
-    {"disable_cpt", "timing disable_cpt ANALYSIS KIND ITEM...: leaves cells, ports or nets out of the analysis"},
+    {"disable_cpt", "timing disable_cpt ANALYSIS KIND ITEM...: leaves cells, ports, nets or clocks out of path tracing"},
     {"enable_constraints", "timing enable_constraints ANALYSIS CONSTRAINT...: takes constraints into the analysis again"},
     {"get", "timing get ANALYSIS NAME: one setting or result of an analysis"},
     {"enable_cpt", "timing enable_cpt ANALYSIS KIND ITEM...: takes cells, ports or nets into the analysis again"},
