@@ -59,11 +59,7 @@ private:
 
 // A handle that tells the test what reached it: its argument vectors and its end.
 struct Seen {
-    struct Arg {
-        Handle* handle;
-        std::string text;
-        bool plainValue;
-    };
+    struct Arg { Handle* handle; std::string text; bool plainValue; };
     std::vector<std::vector<Arg>> calls;
     std::vector<std::string> events;
 };
@@ -79,7 +75,8 @@ public:
         std::vector<Seen::Arg> args;
         for (int i = 0; i < argc; ++i) {
             const char* text = argv[i]->GetString();
-            args.push_back({argv[i], text ? text : "<null>", dynamic_cast<Script::TclObjHandleBase*>(argv[i]) != nullptr});
+            const bool plain = dynamic_cast<Script::TclObjHandleBase*>(argv[i]) != nullptr;
+            args.push_back({argv[i], text ? text : "<null>", plain});
         }
         m_seen.calls.push_back(std::move(args));
         if (onExecute) return onExecute(interp, argc, argv);
@@ -150,43 +147,56 @@ protected:
         handle->SetResult(interp);
         return Result();
     }
+    static PtrHandleBase* HandleOf(const std::string& word) {
+        Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
+        Tcl_IncrRefCount(obj);
+        PtrHandleBase* handle = PtrHandleBase::GetHandleFromTclObj(obj);
+        Tcl_DecrRefCount(obj);
+        return handle;
+    }
+    static bool Starts(const std::string& word, const char* prefix) { return word.rfind(prefix, 0) == 0; }
+    static std::vector<std::string> Ended(const std::string& t) { return {"release " + t, "destroy " + t}; }
 
     Tcl_Interp* interp = nullptr;
     Seen seen;
     IProbe* const someValue = reinterpret_cast<IProbe*>(&seen);  // a value only compared, never called
 };
 
-TEST_F(ScriptTest, HandOverMakesAKelmarCommandFoundByItsWord) {
+TEST_F(ScriptTest, HandOverMakesAKelmarCommandFoundByItsWordUnlessTheHandleIsNoCommand) {
     auto* handle = new RecordingHandle(someValue, interp, seen, "a");
     EXPECT_EQ(handle->GetTclObj(), nullptr);
     const std::string word = HandOver(handle);
-    EXPECT_EQ(word.rfind("::kelmar::IProbe", 0), 0u) << word;
+    EXPECT_TRUE(Starts(word, "::kelmar::IProbe")) << word;
     EXPECT_EQ(word, handle->GetString());
     ASSERT_EQ(Eval("info commands " + word), TCL_OK);
     EXPECT_EQ(Result(), word);
-
     handle->SetVariable(interp, "again");
     EXPECT_EQ(Var("again"), word);
-    Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
-    Tcl_IncrRefCount(obj);
-    EXPECT_EQ(PtrHandleBase::GetHandleFromTclObj(obj), handle);
-    Tcl_SetStringObj(obj, "::kelmar::IProbe0", -1);
-    EXPECT_EQ(PtrHandleBase::GetHandleFromTclObj(obj), nullptr);
-    Tcl_DecrRefCount(obj);
+    EXPECT_EQ(HandleOf(word), handle);
+    EXPECT_EQ(HandleOf("::kelmar::IProbe0"), nullptr);
     EXPECT_TRUE(seen.events.empty());
+
+    // A plain pointer handle, also of no value, gets a word but answers every command with an error.
+    auto* plain = new Script::PtrHandle<IProbe>(nullptr, interp);
+    void* value = someValue;
+    EXPECT_EQ(plain->GetValue(&value), 1);
+    const std::string plainWord = HandOver(plain);
+    EXPECT_TRUE(Starts(plainWord, "::kelmar::IProbe"));
+    EXPECT_EQ(Eval(plainWord + " Anything"), TCL_ERROR);
+    EXPECT_NE(Result().find("is no command"), std::string::npos) << Result();
+    EXPECT_NE(Result().find(plainWord), std::string::npos) << Result();
 }
 
 TEST_F(ScriptTest, ExecuteGetsHandlesAsThemselvesAndOtherWordsAsValues) {
     auto* callee = new RecordingHandle(someValue, interp, seen, "callee");
     auto* other = new OtherRecordingHandle(nullptr, interp, seen, "other");
-    const std::string word = HandOver(callee);
-    ASSERT_EQ(Tcl_SetVar(interp, "o", HandOver(other).c_str(), 0) != nullptr, true);
-
+    const std::string word = HandOver(callee), otherWord = HandOver(other);
+    ASSERT_EQ(Eval("set o " + otherWord), TCL_OK);
     ASSERT_EQ(Eval(word + " Do $o plain 42 ::kelmar::IProbe0 {::kelmar::}"), TCL_OK) << Result();
     EXPECT_EQ(Result(), "7");  // Execute's own result and argc
     ASSERT_EQ(seen.calls.size(), 1u);
     const auto& args = seen.calls[0];
-    const std::vector<std::string> texts = {word, "Do", other->GetString(), "plain", "42", "::kelmar::IProbe0", "::kelmar::"};
+    const std::vector<std::string> texts{word, "Do", otherWord, "plain", "42", "::kelmar::IProbe0", "::kelmar::"};
     ASSERT_EQ(args.size(), texts.size());
     for (size_t i = 0; i < args.size(); ++i) {
         EXPECT_EQ(args[i].text, texts[i]) << i;
@@ -213,17 +223,6 @@ TEST_F(ScriptTest, ExecuteGetsHandlesAsThemselvesAndOtherWordsAsValues) {
     EXPECT_EQ(Result(), "refused");
 }
 
-TEST_F(ScriptTest, PlainPtrHandleIsNoCommandAndNullValueIsAllowed) {
-    auto* plain = new Script::PtrHandle<IProbe>(nullptr, interp);
-    void* value = someValue;
-    EXPECT_EQ(plain->GetValue(&value), 1);
-    const std::string word = HandOver(plain);
-    EXPECT_EQ(word.rfind("::kelmar::IProbe", 0), 0u);
-    EXPECT_EQ(Eval(word + " Anything"), TCL_ERROR);
-    EXPECT_NE(Result().find("is no command"), std::string::npos) << Result();
-    EXPECT_NE(Result().find(word), std::string::npos) << Result();
-}
-
 TEST_F(ScriptTest, SameValueAndClassGivesOneWordAndTheNewerHandleEndsAfterTheCommand) {
     auto* first = new RecordingHandle(someValue, interp, seen, "first");
     auto* second = new RecordingHandle(someValue, interp, seen, "second");
@@ -232,17 +231,16 @@ TEST_F(ScriptTest, SameValueAndClassGivesOneWordAndTheNewerHandleEndsAfterTheCom
     EXPECT_EQ(HandOver(first), word);
     EXPECT_EQ(HandOver(second), word);
     EXPECT_EQ(second->GetString(), word);  // still usable by its maker
-    EXPECT_NE(HandOver(otherClass), word);
+    const std::string otherWord = HandOver(otherClass);
+    EXPECT_NE(otherWord, word);
     EXPECT_TRUE(seen.events.empty());
-
     ASSERT_EQ(Eval(word + " Do"), TCL_OK);
-    EXPECT_EQ(seen.events, (std::vector<std::string>{"release second", "destroy second"}));
+    EXPECT_EQ(seen.events, Ended("second"));
     EXPECT_EQ(seen.calls.size(), 1u);
 
     // Inside a command, with another command nested in it, the duplicate lives until the outer one
     // has returned.
     seen.events.clear();
-    const std::string otherWord = otherClass->GetString();
     first->onExecute = [&](Tcl_Interp* in, int, Handle* const*) {
         auto* third = new RecordingHandle(someValue, in, seen, "third");
         third->SetResult(in);
@@ -254,10 +252,10 @@ TEST_F(ScriptTest, SameValueAndClassGivesOneWordAndTheNewerHandleEndsAfterTheCom
     };
     ASSERT_EQ(Eval(word + " Do"), TCL_OK);
     EXPECT_EQ(Result(), word);
-    EXPECT_EQ(seen.events, (std::vector<std::string>{"release third", "destroy third"}));
+    EXPECT_EQ(seen.events, Ended("third"));
 }
 
-TEST_F(ScriptTest, AnotherInterpreterGetsItsOwnCommand) {
+TEST_F(ScriptTest, AnotherInterpreterGetsItsOwnCommandAndEndsItWithItself) {
     Tcl_Interp* second = Tcl_CreateInterp();
     ASSERT_EQ(Kelmarpkg_Init(second), TCL_OK);
     const std::string word = HandOver(new RecordingHandle(someValue, interp, seen, "here"));
@@ -267,28 +265,15 @@ TEST_F(ScriptTest, AnotherInterpreterGetsItsOwnCommand) {
     EXPECT_NE(thereWord, word);
     EXPECT_EQ(Tcl_Eval(second, (thereWord + " Do").c_str()), TCL_OK);
     Tcl_DeleteInterp(second);
-    EXPECT_EQ(seen.events, (std::vector<std::string>{"release there", "destroy there"}));
+    EXPECT_EQ(seen.events, Ended("there"));
 }
 
-TEST_F(ScriptTest, RenameToNothingEndsTheHandleOnceAndTheRegistryForgetsIt) {
-    auto* handle = new RecordingHandle(someValue, interp, seen, "a");
-    const std::string word = HandOver(handle);
-    ASSERT_EQ(Eval("rename " + word + " {}"), TCL_OK);
-    EXPECT_EQ(seen.events, (std::vector<std::string>{"release a", "destroy a"}));
-    Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
-    Tcl_IncrRefCount(obj);
-    EXPECT_EQ(PtrHandleBase::GetHandleFromTclObj(obj), nullptr);
-    Tcl_DecrRefCount(obj);
-
-    // The value has no word any more: a new handle of it gets a new one.
-    EXPECT_NE(HandOver(new RecordingHandle(someValue, interp, seen, "b")), word);
-}
-
-TEST_F(ScriptTest, HandleRenamedAwayDuringACommandStaysUntilTheCommandReturns) {
+// Renamed to nothing, a handle ends once and is forgotten, though only when the command that
+// renamed it has returned; deleted, it takes its command along.
+TEST_F(ScriptTest, AHandleEndsWithItsCommandAndItsCommandWithIt) {
     auto* caller = new RecordingHandle(someValue, interp, seen, "caller");
     auto* argument = new OtherRecordingHandle(nullptr, interp, seen, "argument");
-    const std::string word = HandOver(caller);
-    const std::string argWord = HandOver(argument);
+    const std::string word = HandOver(caller), argWord = HandOver(argument);
     caller->onExecute = [&](Tcl_Interp* in, int, Handle* const* argv) {
         EXPECT_EQ(Tcl_Eval(in, ("rename " + argWord + " {}").c_str()), TCL_OK);
         EXPECT_TRUE(seen.events.empty());
@@ -296,22 +281,26 @@ TEST_F(ScriptTest, HandleRenamedAwayDuringACommandStaysUntilTheCommandReturns) {
         return TCL_OK;
     };
     ASSERT_EQ(Eval(word + " Do " + argWord), TCL_OK);
-    EXPECT_EQ(seen.events, (std::vector<std::string>{"release argument", "destroy argument"}));
-}
+    EXPECT_EQ(seen.events, Ended("argument"));
+    ASSERT_EQ(Eval("rename " + word + " {}"), TCL_OK);
+    EXPECT_EQ(seen.events, (std::vector<std::string>{"release argument", "destroy argument", "release caller",
+                                                     "destroy caller"}));
+    EXPECT_EQ(HandleOf(word), nullptr);
+    seen.events.clear();
 
-TEST_F(ScriptTest, DeletedHandleTakesItsCommandAndCopyIsUnregistered) {
+    // The value has no word any more: a new handle of it gets a new one.
     auto* handle = new RecordingHandle(someValue, interp, seen, "a");
-    const std::string word = HandOver(handle);
+    const std::string newWord = HandOver(handle);
+    EXPECT_NE(newWord, word);
     RecordingHandle copy(*handle);
-    EXPECT_EQ(copy.GetTclObj(), nullptr);
+    EXPECT_EQ(copy.GetTclObj(), nullptr);  // a copy is no command
     void* value = nullptr;
     EXPECT_EQ(copy.GetValue(&value), 0);
     EXPECT_EQ(value, someValue);
     EXPECT_EQ(copy.GetTclInterp(), interp);
     EXPECT_STREQ(copy.GetTypeName(), "IProbe");
-
     delete handle;
-    ASSERT_EQ(Eval("info commands " + word), TCL_OK);
+    ASSERT_EQ(Eval("info commands " + newWord), TCL_OK);
     EXPECT_EQ(Result(), "");
     EXPECT_EQ(seen.events, (std::vector<std::string>{"destroy a"}));
 }
@@ -342,53 +331,47 @@ TEST_F(ScriptTest, PlainValueHandles) {
     EXPECT_STREQ(text.GetSharedHandle()->GetString(), "");
 }
 
+// One fetch of a value of type T, as text: the value when the fetch succeeds.
+template <class T>
+std::string Fetched(int (*fetch)(T&, Tcl_Interp*, Handle*, int), Tcl_Interp* interp, const char* word,
+                    int direction, int& status) {
+    Script::TclStringHandle handle(word, interp);
+    T value{};
+    status = fetch(value, interp, &handle, direction);
+    if constexpr (std::is_same_v<T, Port_String>) return value.c_str();
+    else return std::to_string(value);
+}
+
 // The fetches read the word (IN) or the variable it names (INOUT), and leave Tcl's own message.
 TEST_F(ScriptTest, FetchesByDirection) {
-    using Script::TclWrapSupport;
+    using S = Script::TclWrapSupport;
     ASSERT_EQ(Eval("set s {a text}; set b off; set i -17"), TCL_OK);
-    struct Case {
-        const char* word;
-        int direction;
-        const char* kind;  // "string", "bool" or "int"
-        int status;
-        const char* expected;  // the value, or a piece of the message
-    };
-    const Case cases[] = {
-        {"hello world", Script::IN, "string", 0, "hello world"},
-        {"s", Script::INOUT, "string", 0, "a text"},
-        {"nosuch", Script::INOUT, "string", 1, "can't read \"nosuch\": no such variable"},
-        {"s", Script::OUT, "string", 1, "OUT"},
-        {"s", Script::RESULT, "string", 1, "RESULT"},
-        {"yes", Script::IN, "bool", 0, "1"},
-        {"b", Script::INOUT, "bool", 0, "0"},
-        {"maybe", Script::IN, "bool", 1, "expected boolean value but got \"maybe\""},
-        {"s", Script::INOUT, "bool", 1, "expected boolean value but got \"a text\""},
-        {"b", Script::OUT, "bool", 1, "OUT"},
-        {"2147483647", Script::IN, "int", 0, "2147483647"},
-        {"i", Script::INOUT, "int", 0, "-17"},
-        {"4x", Script::IN, "int", 1, "expected integer but got \"4x\""},
-        {"nosuch", Script::INOUT, "int", 1, "no such variable"},
-        {"i", Script::RESULT, "int", 1, "RESULT"},
+    struct Case { const char* word; int direction; char kind; int status; const char* expected; };
+    const Case cases[] = {  // kind s string, b bool, i int; expected: the value, or a piece of the message
+        {"hello world", Script::IN, 's', 0, "hello world"},
+        {"s", Script::INOUT, 's', 0, "a text"},
+        {"nosuch", Script::INOUT, 's', 1, "can't read \"nosuch\": no such variable"},
+        {"s", Script::OUT, 's', 1, "OUT"},
+        {"s", Script::RESULT, 's', 1, "RESULT"},
+        {"yes", Script::IN, 'b', 0, "1"},
+        {"b", Script::INOUT, 'b', 0, "0"},
+        {"maybe", Script::IN, 'b', 1, "expected boolean value but got \"maybe\""},
+        {"s", Script::INOUT, 'b', 1, "expected boolean value but got \"a text\""},
+        {"b", Script::OUT, 'b', 1, "OUT"},
+        {"2147483647", Script::IN, 'i', 0, "2147483647"},
+        {"i", Script::INOUT, 'i', 0, "-17"},
+        {"4x", Script::IN, 'i', 1, "expected integer but got \"4x\""},
+        {"nosuch", Script::INOUT, 'i', 1, "no such variable"},
+        {"i", Script::RESULT, 'i', 1, "RESULT"},
     };
     for (const Case& c : cases) {
-        SCOPED_TRACE(std::string(c.kind) + " " + c.word + " " + std::to_string(c.direction));
+        SCOPED_TRACE(std::string(1, c.kind) + " " + c.word + " " + std::to_string(c.direction));
         Tcl_ResetResult(interp);
-        Script::TclStringHandle handle(c.word, interp);
-        std::string got;
         int status = 1;
-        if (std::string(c.kind) == "string") {
-            Port_String value;
-            status = TclWrapSupport::FetchString(value, interp, &handle, c.direction);
-            got = value.c_str();
-        } else if (std::string(c.kind) == "bool") {
-            bool value = false;
-            status = TclWrapSupport::FetchBool(value, interp, &handle, c.direction);
-            got = value ? "1" : "0";
-        } else {
-            int32_t value = 0;
-            status = TclWrapSupport::FetchInt32(value, interp, &handle, c.direction);
-            got = std::to_string(value);
-        }
+        const int d = c.direction;
+        const std::string got = c.kind == 's'   ? Fetched(&S::FetchString, interp, c.word, d, status)
+                                : c.kind == 'b' ? Fetched(&S::FetchBool, interp, c.word, d, status)
+                                                : Fetched(&S::FetchInt32, interp, c.word, d, status);
         EXPECT_EQ(status, c.status);
         if (c.status == 0) {
             EXPECT_EQ(got, c.expected);
@@ -397,39 +380,36 @@ TEST_F(ScriptTest, FetchesByDirection) {
         }
     }
     Port_String value;
-    EXPECT_EQ(TclWrapSupport::FetchString(value, interp, nullptr, Script::IN), 1);
+    EXPECT_EQ(S::FetchString(value, interp, nullptr, Script::IN), 1);
 
     Port::XUID id;
-    Script::TclStringHandle idWord(Text(IProbeID).c_str(), interp);
-    EXPECT_EQ(TclWrapSupport::FetchGuid(id, interp, &idWord, Script::IN), 0);
+    Script::TclStringHandle idWord(Text(IProbeID).c_str(), interp), noId("no identifier", interp);
+    EXPECT_EQ(S::FetchGuid(id, interp, &idWord, Script::IN), 0);
     EXPECT_TRUE(id == IProbeID);
-    Script::TclStringHandle noId("no identifier", interp);
-    EXPECT_EQ(TclWrapSupport::FetchGuid(id, interp, &noId, Script::IN), 0);
+    EXPECT_EQ(S::FetchGuid(id, interp, &noId, Script::IN), 0);
     EXPECT_TRUE(id.IsNull());
 }
 
 TEST_F(ScriptTest, StoresByDirection) {
-    using Script::TclWrapSupport;
-    Script::TclStringHandle target("out", interp);
-    EXPECT_EQ(TclWrapSupport::StoreString("stored", interp, &target, Script::OUT), 0);
+    using S = Script::TclWrapSupport;
+    Script::TclStringHandle target("out", interp), array("arr", interp);
+    EXPECT_EQ(S::StoreString("stored", interp, &target, Script::OUT), 0);
     EXPECT_EQ(Var("out"), "stored");
-
     // The length is the string's own: an embedded nul reaches Tcl.
-    EXPECT_EQ(TclWrapSupport::StoreString(Port_String("a\0b", 3), interp, nullptr, Script::RESULT), 0);
+    EXPECT_EQ(S::StoreString(Port_String("a\0b", 3), interp, nullptr, Script::RESULT), 0);
     int length = 0;
     Tcl_GetStringFromObj(Tcl_GetObjResult(interp), &length);
     EXPECT_EQ(length, 3);
 
-    EXPECT_EQ(TclWrapSupport::StoreString("x", interp, nullptr, Script::OUT), 1);
+    EXPECT_EQ(S::StoreString("x", interp, nullptr, Script::OUT), 1);
     EXPECT_NE(Result().find("the variable is NULL"), std::string::npos) << Result();
     ASSERT_EQ(Eval("array set arr {}"), TCL_OK);
-    Script::TclStringHandle array("arr", interp);
-    EXPECT_EQ(TclWrapSupport::StoreString("x", interp, &array, Script::OUT), 1);
+    EXPECT_EQ(S::StoreString("x", interp, &array, Script::OUT), 1);
     EXPECT_NE(Result().find("can't set \"arr\": variable is array"), std::string::npos) << Result();
-    EXPECT_EQ(TclWrapSupport::StoreString("x", interp, &target, Script::IN), 1);
+    EXPECT_EQ(S::StoreString("x", interp, &target, Script::IN), 1);
     EXPECT_EQ(Var("out"), "stored");
 
-    EXPECT_EQ(TclWrapSupport::StoreInt64(int64_t{1} << 40, interp, nullptr, Script::RESULT), 0);
+    EXPECT_EQ(S::StoreInt64(int64_t{1} << 40, interp, nullptr, Script::RESULT), 0);
     Tcl_WideInt wide = 0;
     ASSERT_EQ(Tcl_GetWideIntFromObj(nullptr, Tcl_GetObjResult(interp), &wide), TCL_OK);
     EXPECT_EQ(wide, Tcl_WideInt{1} << 40);
@@ -445,7 +425,6 @@ TEST_F(ScriptTest, CreateVariablesUpToTheTerminator) {
     EXPECT_EQ(Script::TclWrapSupport::CreateVariables(interp, table), 0) << Result();
     EXPECT_EQ(Var("::kelmar::Probe::IProbeID"), Text(IProbeID));
     EXPECT_EQ(Var("::deep::er::IInterfaceID"), Text(CitI::IInterfaceID));
-    EXPECT_TRUE(Port::XUID(Var("::kelmar::Probe::IProbeID").c_str()) == IProbeID);
     EXPECT_EQ(Var("::kelmar::Probe::Behind"), "<unset>");
 
     Script::TclWrapIDEntry bad[] = {
@@ -460,53 +439,51 @@ TEST_F(ScriptTest, CreateVariablesUpToTheTerminator) {
 }
 
 TEST_F(ScriptTest, ResolverWithNullWithoutAndWithAFactory) {
-    using Script::TclWrapSupport;
-    EXPECT_EQ(TclWrapSupport::TclWrapResolver(IProbeID, nullptr, interp), TCL_OK);
+    const auto resolve = [&](const Port::XUID& id, CitI::IInterface* object) {
+        return Script::TclWrapSupport::TclWrapResolver(id, object, interp);
+    };
+    EXPECT_EQ(resolve(IProbeID, nullptr), TCL_OK);
     EXPECT_EQ(Result(), "0");
-
     CommonI::RefCountPtr<IProbe> object(new ProbeObject);
-    EXPECT_EQ(TclWrapSupport::TclWrapResolver(IUnwrappedID, object.get(), interp), TCL_ERROR);
+    EXPECT_EQ(resolve(IUnwrappedID, object.get()), TCL_ERROR);
     EXPECT_EQ(Result(), "no wrapper for interface " + Text(IUnwrappedID));
 
-    ASSERT_EQ(TclWrapSupport::TclWrapResolver(IProbeID, object.get(), interp), TCL_OK);
+    ASSERT_EQ(resolve(IProbeID, object.get()), TCL_OK);
     const std::string word = Result();
-    EXPECT_EQ(word.rfind("::kelmar::IProbe", 0), 0u);
+    EXPECT_TRUE(Starts(word, "::kelmar::IProbe"));
     auto* probe = static_cast<ProbeObject*>(object.get());
     EXPECT_EQ(probe->Count(), 2);
-
     // A second wrapper of the same object shares the word and lets its reference go after the next
     // command.
-    ASSERT_EQ(TclWrapSupport::TclWrapResolver(IProbeID, object.get(), interp), TCL_OK);
+    ASSERT_EQ(resolve(IProbeID, object.get()), TCL_OK);
     EXPECT_EQ(Result(), word);
     EXPECT_EQ(probe->Count(), 3);
     EXPECT_EQ(Eval(word + " Do"), TCL_ERROR);  // a wrapper without commands of its own
     EXPECT_EQ(probe->Count(), 2);
-
     ASSERT_EQ(Eval("rename " + word + " {}"), TCL_OK);
     EXPECT_EQ(probe->Count(), 1);
 }
 
 TEST_F(ScriptTest, SupportWrappersAnswerGetInterfaceOnly) {
     auto* object = new ProbeObject(true);
-    CitI::IInterface* helper = Script::TclWrapFactory::CreateInstance(CitI::IInterfaceID, static_cast<IProbe*>(object), interp);
+    CitI::IInterface* helper =
+        Script::TclWrapFactory::CreateInstance(CitI::IInterfaceID, static_cast<IProbe*>(object), interp);
     ASSERT_NE(helper, nullptr);
     EXPECT_EQ(object->Count(), 1);  // the wrapper's reference is the only one
     static_cast<CitI::IScriptHandle*>(helper->GetInterface(CitI::IScriptHandleID))->SetResult(interp);
     const std::string word = Result();
-    EXPECT_EQ(word.rfind("::kelmar::IInterface", 0), 0u) << word;
+    EXPECT_TRUE(Starts(word, "::kelmar::IInterface")) << word;
 
-    ASSERT_EQ(Eval(word + " GetInterface " + Text(IProbeID)), TCL_OK) << Result();
-    const std::string probeWord = Result();
-    EXPECT_EQ(probeWord.rfind("::kelmar::IProbe", 0), 0u) << probeWord;
-    ASSERT_EQ(Eval(word + " GetInterface " + Text(CitI::IInterfaceID) + " ignored"), TCL_OK);
-    EXPECT_EQ(Result(), word);
-    ASSERT_EQ(Eval(word + " GetInterface " + Text(HdcI::IHDProjectID)), TCL_OK) << Result();
-    const std::string projectWord = Result();
-    EXPECT_EQ(projectWord.rfind("::kelmar::IHDProject", 0), 0u) << projectWord;
-    ASSERT_EQ(Eval(projectWord + " GetInterface " + Text(IProbeID)), TCL_OK);
-    EXPECT_EQ(Result(), probeWord);
-    ASSERT_EQ(Eval(word + " GetInterface " + Text(IUnwrappedID)), TCL_OK);
-    EXPECT_EQ(Result(), "0");
+    const auto ask = [&](const std::string& from, const Port::XUID& id, const char* extra = "") {
+        EXPECT_EQ(Eval(from + " GetInterface " + Text(id) + extra), TCL_OK) << Result();
+        return Result();
+    };
+    const std::string probeWord = ask(word, IProbeID), projectWord = ask(word, HdcI::IHDProjectID);
+    EXPECT_TRUE(Starts(probeWord, "::kelmar::IProbe")) << probeWord;
+    EXPECT_TRUE(Starts(projectWord, "::kelmar::IHDProject")) << projectWord;
+    EXPECT_EQ(ask(word, CitI::IInterfaceID, " ignored"), word);
+    EXPECT_EQ(ask(projectWord, IProbeID), probeWord);
+    EXPECT_EQ(ask(word, IUnwrappedID), "0");
     EXPECT_EQ(Eval(word + " GetInterface " + Text(CommonI::IRefCountID)), TCL_ERROR);
     EXPECT_EQ(Result(), "no wrapper for interface " + Text(CommonI::IRefCountID));
     EXPECT_EQ(object->Count(), 3);  // one per word: IInterface, IProbe, IHDProject
