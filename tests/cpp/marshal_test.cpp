@@ -4,6 +4,7 @@
 #include <tcl.h>
 
 #include <filesystem>
+#include <functional>
 #include <stdexcept>
 #include <string>
 
@@ -121,8 +122,8 @@ protected:
         interp = Tcl_CreateInterp();
         Kelmarpkg_Init(interp);
         const std::string dir = LibraryDir();
-        ASSERT_EQ(Eval(("load " + dir + "/libTcltaskI_Morvane.so Tcltaski_morvane").c_str()), TCL_OK) << Result();
-        ASSERT_EQ(Eval(("load " + dir + "/libTcltaskI_TestKit.so Tcltaski_testkit").c_str()), TCL_OK) << Result();
+        ASSERT_EQ(Eval("load " + dir + "/libTcltaskI_Morvane.so Tcltaski_morvane"), TCL_OK) << Result();
+        ASSERT_EQ(Eval("load " + dir + "/libTcltaskI_TestKit.so Tcltaski_testkit"), TCL_OK) << Result();
         ASSERT_TRUE(CitP::Factory::LoadLibraryFactory("libTcltask_Support"));
     }
     static void TearDownTestSuite() { Tcl_DeleteInterp(interp); }
@@ -134,7 +135,7 @@ protected:
         Tcl_SetObjResult(interp, Tcl_NewStringObj("held", -1));
     }
 
-    static int Eval(const char* script) { return Tcl_Eval(interp, script); }
+    static int Eval(const std::string& script) { return Tcl_Eval(interp, script.c_str()); }
     static std::string Result() { return Tcl_GetStringResult(interp); }
     static std::string ErrorInfo() {
         Tcl_Obj* options = Tcl_GetReturnOptions(interp, TCL_ERROR);
@@ -166,9 +167,13 @@ protected:
         Tcl_DecrRefCount(obj);
         return handle;
     }
-    static std::string Made(const char* script) {
+    static std::string Made(const std::string& script) {
         EXPECT_EQ(Eval(script), TCL_OK) << Result();
         return Result();
+    }
+    // Deletes the object commands of the words.
+    static void Forget(const std::string& words) {
+        EXPECT_EQ(Eval("foreach w {" + words + "} { rename $w {} }"), TCL_OK) << Result();
     }
 
     static inline Tcl_Interp* interp = nullptr;
@@ -176,59 +181,46 @@ protected:
 
 using Word = Script::TclStringHandle;
 
-// Directions that no command uses ---------------------------------------------------------------
-
-TEST_F(Marshal, FetchTypeRefusesOutAndResult) {
+// Directions that no command uses: each is a report without reset, and drops no reference.
+TEST_F(Marshal, FetchesRefuseOutAndResultStoresRefuseInAndAnOutWithoutVariable) {
     Word word("0", interp);
     Dpm::IProjectHelper* helper = nullptr;
-    ExpectReportWithoutReset(Fetch_Type(helper, interp, &word, Script::OUT),
-                             "Tetch_Type was called for an OUT parameter, which indicates a failure.");
-    SetUp();
-    ExpectReportWithoutReset(Fetch_Type(helper, interp, nullptr, Script::RESULT),
-                             "Fetch_Type was called for a RESULT, which indicates a failure.");
-}
-
-TEST_F(Marshal, FetchInterfaceTypeRefusesOutAndResult) {
-    Word word("x", interp);
+    FakeHelper fake;
     CitI::MIInterface component;
-    ExpectReportWithoutReset(Fetch_InterfaceType(component, interp, &word, Script::OUT),
-                             "Fetch_InterfaceType was called for an OUT parameter, which indicates a failure.");
-    SetUp();
-    ExpectReportWithoutReset(Fetch_InterfaceType(component, interp, nullptr, Script::RESULT),
-                             "Fetch_InterfaceType was called for a RESULT, which indicates a failure");
-
     UtilI::MITclProperty property;
-    SetUp();
-    ExpectReportWithoutReset(
-        Fetch_InterfaceType(property, interp, &word, Script::OUT),
-        "Fetch_InterfaceType<UtilI::ITclProperty> was called for an OUT parameter, which indicates a failure.");
-    SetUp();
-    ExpectReportWithoutReset(Fetch_InterfaceType(property, interp, nullptr, Script::RESULT),
-                             "Fetch_InterfaceType was called for a RESULT, which indicates a failure");
+    HdcI::MIHDProject project(new FakeHDProject), none;
+    const std::pair<std::function<int()>, const char*> cases[] = {
+        {[&] { return Fetch_Type(helper, interp, &word, Script::OUT); },
+         "Tetch_Type was called for an OUT parameter, which indicates a failure."},
+        {[&] { return Fetch_Type(helper, interp, nullptr, Script::RESULT); },
+         "Fetch_Type was called for a RESULT, which indicates a failure."},
+        {[&] { return Fetch_InterfaceType(component, interp, &word, Script::OUT); },
+         "Fetch_InterfaceType was called for an OUT parameter, which indicates a failure."},
+        {[&] { return Fetch_InterfaceType(component, interp, nullptr, Script::RESULT); },
+         "Fetch_InterfaceType was called for a RESULT, which indicates a failure"},
+        {[&] { return Fetch_InterfaceType(property, interp, &word, Script::OUT); },
+         "Fetch_InterfaceType<UtilI::ITclProperty> was called for an OUT parameter, which indicates a failure."},
+        {[&] { return Fetch_InterfaceType(property, interp, nullptr, Script::RESULT); },
+         "Fetch_InterfaceType was called for a RESULT, which indicates a failure"},
+        {[&] { return Store_Type<Dpm::IProjectHelper>(&fake, interp, nullptr, Script::IN); },
+         "Store_Type was called for an IN parameter, which  indicates a failure."},
+        {[&] { return Store_Type<Dpm::IProjectHelper>(&fake, interp, nullptr, Script::OUT); },
+         "Store_Type was called for an OUT parameter, but the variable is NULL"},
+        {[&] { return Store_Type<Dpm::IProjectHelper>(nullptr, interp, nullptr, Script::OUT); },
+         "Store_Type was called for an OUT parameter, but the variable is NULL"},
+        {[&] { return Store_InterfaceType(project, interp, nullptr, Script::IN); },
+         "Store_InterfaceType was called for an IN parameter, which  indicates a failure."},
+        {[&] { return Store_InterfaceType(project, interp, nullptr, Script::OUT); },
+         "Store_InterfaceType was called for an OUT parameter, but the variable is NULL"},
+        {[&] { return Store_InterfaceType(none, interp, nullptr, Script::OUT); },
+         "Store_InterfaceType was called for an OUT parameter, but the variable is NULL"},
+    };
+    for (const auto& [run, text] : cases) {
+        SCOPED_TRACE(text);
+        SetUp();
+        ExpectReportWithoutReset(run(), text);
+    }
     EXPECT_FALSE(property);
-}
-
-TEST_F(Marshal, StoresRefuseInAndAnOutWithoutVariable) {
-    FakeHelper helper;
-    ExpectReportWithoutReset(Store_Type<Dpm::IProjectHelper>(&helper, interp, nullptr, Script::IN),
-                             "Store_Type was called for an IN parameter, which  indicates a failure.");
-    SetUp();
-    ExpectReportWithoutReset(Store_Type<Dpm::IProjectHelper>(&helper, interp, nullptr, Script::OUT),
-                             "Store_Type was called for an OUT parameter, but the variable is NULL");
-    SetUp();
-    ExpectReportWithoutReset(Store_Type<Dpm::IProjectHelper>(nullptr, interp, nullptr, Script::OUT),
-                             "Store_Type was called for an OUT parameter, but the variable is NULL");
-
-    HdcI::MIHDProject project(new FakeHDProject);
-    SetUp();
-    ExpectReportWithoutReset(Store_InterfaceType(project, interp, nullptr, Script::IN),
-                             "Store_InterfaceType was called for an IN parameter, which  indicates a failure.");
-    SetUp();
-    ExpectReportWithoutReset(Store_InterfaceType(project, interp, nullptr, Script::OUT),
-                             "Store_InterfaceType was called for an OUT parameter, but the variable is NULL");
-    SetUp();
-    ExpectReportWithoutReset(Store_InterfaceType(HdcI::MIHDProject(), interp, nullptr, Script::OUT),
-                             "Store_InterfaceType was called for an OUT parameter, but the variable is NULL");
     EXPECT_EQ(static_cast<FakeHDProject*>(project.get())->Count(), 1);
 }
 
@@ -300,8 +292,7 @@ TEST_F(Marshal, ObjectsGoOutAsWrappersAndComeBack) {
     SetUp();
     ExpectReportWithoutReset(Fetch_Type(fetched, interp, &back, Script::IN), "Unable to fetch an object from parameter");
 
-    EXPECT_EQ(Eval(("rename " + word + " {}; rename " + resultWord + " {}; rename " + helperWord + " {}").c_str()), TCL_OK)
-        << Result();
+    Forget(word + " " + resultWord + " " + helperWord);
     EXPECT_EQ(raw->Count(), 1);
     EXPECT_EQ(other->Count(), 1);
 }
@@ -315,7 +306,7 @@ TEST_F(Marshal, ComponentsComeInCountedFromHandlesAndVariables) {
     ASSERT_TRUE(component);
 
     // INOUT: a variable that holds no handle, or none at all, is a null component and no failure.
-    Eval(("set holder " + word + "; set plain text").c_str());
+    Eval("set holder " + word + "; set plain text");
     for (const char* variable : {"holder", "plain", "nosuch"}) {
         Word name(variable, interp);
         CitI::MIInterface fromVariable(component);
@@ -323,7 +314,7 @@ TEST_F(Marshal, ComponentsComeInCountedFromHandlesAndVariables) {
         EXPECT_EQ(fromVariable.get(), std::string(variable) == "holder" ? component.get() : nullptr) << variable;
     }
     component = nullptr;
-    EXPECT_EQ(Eval(("rename " + word + " {}").c_str()), TCL_OK);
+    Forget(word);
 }
 
 // Properties --------------------------------------------------------------------------------------
@@ -395,35 +386,30 @@ TEST_F(Marshal, ResultStoreOfAProperty) {
 
 // Dispatch paths that no script reaches -----------------------------------------------------------
 
-TEST_F(Marshal, AWordWithoutTextIsNULL) {
-    const std::string word = Made("testkit::new ISearch");
-    Word self(word.c_str(), interp);
+// An unknown word resets, so that what errorInfo held before is gone; too few words and a
+// GetInterface without an object are reports without reset.
+TEST_F(Marshal, AWordWithoutTextIsNULLAndTheCountAndGetInterfaceFailuresDoNotReset) {
+    const std::string word = Made("testkit::new ISearch"), orphan = Made("testkit::orphan ISearch");
     TextlessHandle textless;
-    Script::Handle* argv[] = {&self, &textless};
-    SetUp();
-    EXPECT_EQ(HandleOf(word)->Execute(2, argv, interp), 1);
-    EXPECT_EQ(Result(), "Unknown command NULL for TcltaskI::TclWrapISearch\n"
-                        "  Valid commands for this object are:\n    search\n    GetInterface\n");
-    // The unknown word resets: what errorInfo held before is gone.
-    EXPECT_EQ(ErrorInfo().rfind(Result(), 0), 0u);
-    EXPECT_EQ(Eval(("rename " + word + " {}").c_str()), TCL_OK);
-}
-
-TEST_F(Marshal, TooFewWordsAndGetInterfaceFailuresDoNotReset) {
-    const std::string word = Made("testkit::new ISearch");
-    const std::string orphan = Made("testkit::orphan ISearch");
     Word self(word.c_str(), interp), search("search", interp), getInterface("GetInterface", interp),
         id(Tcl_GetVar(interp, "::kelmar::TcltaskI::ISearchID", TCL_GLOBAL_ONLY), interp);
+    Script::Handle* noText[] = {&self, &textless};
+    SetUp();
+    EXPECT_EQ(HandleOf(word)->Execute(2, noText, interp), 1);
+    EXPECT_EQ(Result(), "Unknown command NULL for TcltaskI::TclWrapISearch\n"
+                        "  Valid commands for this object are:\n    search\n    GetInterface\n");
+    EXPECT_EQ(ErrorInfo().rfind(Result(), 0), 0u);
+
     Script::Handle* tooFew[] = {&self, &search};
     SetUp();
     ExpectReportWithoutReset(HandleOf(word)->Execute(2, tooFew, interp),
                              "Wrong number of arguments: '" + word.substr(10) + " search'\nPlease type 'help " +
                                  word.substr(10) + " search' to get more information");
-    SetUp();
     Script::Handle* noObject[] = {&self, &getInterface, &id};
+    SetUp();
     ExpectReportWithoutReset(HandleOf(orphan)->Execute(3, noObject, interp),
                              "Failed to get TcltaskI::ISearch in TcltaskI::TclWrapISearch::GetInterface.");
-    EXPECT_EQ(Eval(("rename " + word + " {}; rename " + orphan + " {}").c_str()), TCL_OK);
+    Forget(word + " " + orphan);
 }
 
 TEST_F(Marshal, GetInterfaceCatchesAnException) {
@@ -438,12 +424,12 @@ TEST_F(Marshal, GetInterfaceCatchesAnException) {
     owner = nullptr;  // the wrapper holds the object from here on
 
     SetUp();
-    EXPECT_EQ(Eval((word + " GetInterface 11111111-2222-3333-4444-555555555555").c_str()), TCL_ERROR);
+    EXPECT_EQ(Eval(word + " GetInterface 11111111-2222-3333-4444-555555555555"), TCL_ERROR);
     EXPECT_EQ(Result(), "An exception took place while calling TcltaskI::TclWrapITclProject::GetInterface.");
-    EXPECT_EQ(Eval((word + " GetInterface $::kelmar::TcltaskI::ITclProjectID").c_str()), TCL_OK) << Result();
+    EXPECT_EQ(Eval(word + " GetInterface $::kelmar::TcltaskI::ITclProjectID"), TCL_OK) << Result();
     EXPECT_EQ(Result(), word);
     EXPECT_EQ(project->Count(), 1);
-    EXPECT_EQ(Eval(("rename " + word + " {}").c_str()), TCL_OK);
+    Forget(word);
 }
 
 TEST_F(Marshal, AnOutObjectWithoutVariableEndsTheMethodBeforeTheString) {
@@ -461,8 +447,8 @@ TEST_F(Marshal, AnOutObjectWithoutVariableEndsTheMethodBeforeTheString) {
             << command;
         EXPECT_EQ(Var("messageOut"), "<unset>") << command;
     }
-    EXPECT_EQ(Made(("testkit::calls " + manager).c_str()), "GetCurrentTclProject GetCurrentHDProject GetCurrentProjectHelper");
-    EXPECT_EQ(Eval(("rename " + manager + " {}").c_str()), TCL_OK);
+    EXPECT_EQ(Made("testkit::calls " + manager), "GetCurrentTclProject GetCurrentHDProject GetCurrentProjectHelper");
+    Forget(manager);
 }
 
 }  // namespace
