@@ -17,6 +17,9 @@ proc infoHolds {outcome} {
     expr {$code == 1 && [string first $result $info] == 0}
 }
 
+# {code result} of a script run in the caller's frame.
+proc ran {script} { lrange [uplevel 1 [list outcome $script]] 0 1 }
+
 # Runs a script in the caller's frame, then deletes the object commands it made, and gives what is
 # still alive beyond what was before, as {kind change ...} for each count of `testkit::live` that
 # moved: empty when the script and its wrappers left nothing behind. A script that fails gives
@@ -37,6 +40,12 @@ proc leftAlive {script} {
     return $moved
 }
 
+# Runs a script in the caller's frame with a fault of the kit switched on, off again on every way out.
+proc underFault {fault script} {
+    testkit::fault $fault on
+    try { uplevel 1 $script } finally { testkit::fault $fault off }
+}
+
 # A kit handler answering each operation by the dict given for it in `answers`, the others by {};
 # the answer `-error` makes the handler fail, so that the kit's operation throws.
 proc answerBy {answers} { list ::kitAnswer $answers }
@@ -45,20 +54,6 @@ proc kitAnswer {answers op args} {
     set answer [dict get $answers $op]
     if {$answer eq "-error"} { error "$op refused by the test" }
     return $answer
-}
-
-# The identifier variable of a task interface, e.g. ifaceId ICollection.
-proc ifaceId {iface} { set ::kelmar::TcltaskI::${iface}ID }
-
-# {code result} of a script run in the caller's frame.
-proc ran {script} { lrange [uplevel 1 [list outcome $script]] 0 1 }
-
-# The calls that `$word args...` made of its kit object, after forgetting the earlier ones; when the
-# command fails, {error TEXT} instead.
-proc callsOf {word args} {
-    testkit::reset $word
-    if {[catch {$word {*}$args} text]} { return [list error $text] }
-    testkit::calls $word
 }
 
 # A kit handler by which every operation answers what the global variable `name` holds at the time
@@ -70,7 +65,43 @@ proc kitAnswerFrom {name op args} {
     return $answer
 }
 
-# The package's own texts of the option passes and the frames.
+# The identifier variable of a task interface, e.g. ifaceId ICollection.
+proc ifaceId {iface} { set ::kelmar::TcltaskI::${iface}ID }
+
+# The nine classes whose commands run the matched or switch frame. kitObjects makes, in the
+# caller, obj($class) answering what ::reply holds and with help "usage: %W", and orphan($class)
+# without an object.
+set optionClasses {ICollection IGlobal IObject IGraphicalView IHighlight ISelection ISearch ITimingAnalysis IXFloorplan}
+set reply {}
+proc kitObjects {} {
+    upvar 1 obj obj orphan orphan
+    foreach class $::optionClasses {
+        set obj($class) [testkit::new $class -handler [answerFrom reply] -help "usage: %W"]
+        set orphan($class) [testkit::orphan $class]
+    }
+}
+
+# The calls that `$word args...` made of its kit object, after forgetting the earlier ones; when the
+# command fails, {error TEXT} followed by the calls it made all the same.
+proc callsOf {word args} {
+    testkit::reset $word
+    if {[catch {$word {*}$args} text]} { return [list error $text {*}[testkit::calls $word]] }
+    testkit::calls $word
+}
+
+# One test of callsOf per row {class words expected} of `rows`, on the caller's obj($class), named
+# id.1, id.2...; `expected` is substituted in the caller, so that it can use the texts below.
+proc callsTable {id rows} {
+    upvar 1 obj obj
+    set n 0
+    foreach {class words expected} $rows {
+        test $id.[incr n] "$class $words" -body [list callsOf $obj($class) {*}$words] \
+            -result [uplevel 1 [list subst $expected]]
+    }
+}
+
+# The package's own texts of the option passes and the frames; the procs give a failing row's
+# {error TEXT}, with the help of the kit objects ("usage: %W") where the package adds it.
 set wrongCountText "Wrong number of required arguments specified."
 set loaderText "Error loading command argument matcher component library or while creating the command matcher component."
 set ambiguousText "Ambiguous optional argument 'errors\n"
@@ -87,3 +118,13 @@ proc notASwitchText {word} { return "The current argument \"$word\" is not an op
 proc unrecognizedText {name} { return "Unrecognized optional argument \"-$name\"" }
 proc noObjectText {class word} { return "Failed to get pointer to wrapped object in TcltaskI::TclWrap${class}::kel_$word" }
 proc exceptionText {class word} { return "An exception took place while calling TcltaskI::TclWrap${class}::kel_$word" }
+proc tooFewText {object word} {
+    set name [regsub {^::kelmar::} $object {}]
+    return "Wrong number of arguments: '$name $word'\nPlease type 'help $name $word' to get more information"
+}
+proc wrong {word} { list error "$::wrongCountText\nusage: $word" }
+proc noMatch {typed args} { list error [noMatchText $typed {*}$args] }
+proc ambiguous {} { list error $::ambiguousText }
+proc expects {name type} { list error [expectsValueText $name $type] }
+proc notASwitch {word help} { list error "[notASwitchText $word]\nusage: $help" }
+proc unrecognized {name help} { list error "[unrecognizedText $name]\nusage: $help" }
