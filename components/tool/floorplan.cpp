@@ -193,272 +193,259 @@ public:
     }
 
     RESULT close(bool nosave, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData& plan = Plan(*state);
-        if (!plan.open) return Fail(message, kNotOpen);
-        std::string file;
-        if (!nosave && !Commit(*state, file, message)) return 0;
-        if (!Answer(DictBuilder().Add("saved", !nosave).Add("file", file).Take(), result, message)) return 0;
-        plan = FloorplanData{};
-        return 1;
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            FloorplanData& plan = Plan(state);
+            if (!plan.open) return Fail(message, kNotOpen);
+            std::string file;
+            if (!nosave && !Commit(state, file, message)) return 0;
+            if (!Answer(DictBuilder().Add("saved", !nosave).Add("file", file).Take(), result, message)) return 0;
+            plan = FloorplanData{};
+            return 1;
+        });
     }
 
     RESULT save(Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        std::string file;
-        if (!Commit(*state, file, message)) return 0;
-        return Answer(NewText(file), result, message);
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            std::string file;
+            if (!Commit(state, file, message)) return 0;
+            return Answer(NewText(file), result, message);
+        });
     }
 
     RESULT import(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result,
                   Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        FloorplanConstraints read;
-        bool any = false;
-        for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
-            FloorplanConstraints one;
-            std::string error;
-            if (!Load(form, file, one, error)) return Fail(message, error);
-            MergeConstraints(read, one);
-            any = true;
-        }
-        if (!any) return Fail(message, "nothing to import: give -ucf, -csv, -vhdl or -vlog with a file");
-        // The files' blocks and prohibited sites take the place of the floorplan's; ports they do not
-        // name stay where they are.
-        FloorplanConstraints changed = plan->constraints;
-        changed.blocks = read.blocks;
-        changed.prohibited = read.prohibited;
-        for (const auto& [port, site] : read.ports) changed.ports[port] = site;
-        if (std::string error = CheckConstraints(*state->CurrentDesign(), plan->device, changed); !error.empty())
-            return Fail(message, "the imported constraints do not fit: " + error);
-        Tcl_Obj* answer = DictBuilder()
-                              .Add("blocks", read.blocks.size())
-                              .Add("prohibited", read.prohibited.size())
-                              .Add("ports", read.ports.size())
-                              .Take();
-        if (!Answer(answer, result, message)) return 0;
-        plan->constraints = std::move(changed);
-        plan->modified = true;
-        return 1;
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            FloorplanConstraints read;
+            bool any = false;
+            for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
+                FloorplanConstraints one;
+                std::string error;
+                if (!Load(form, file, one, error)) return Fail(message, error);
+                MergeConstraints(read, one);
+                any = true;
+            }
+            if (!any) return Fail(message, "nothing to import: give -ucf, -csv, -vhdl or -vlog with a file");
+            // The files' blocks and prohibited sites take the place of the floorplan's; ports they do not
+            // name stay where they are.
+            FloorplanConstraints changed = plan.constraints;
+            changed.blocks = read.blocks;
+            changed.prohibited = read.prohibited;
+            for (const auto& [port, site] : read.ports) changed.ports[port] = site;
+            if (std::string error = CheckConstraints(*state.CurrentDesign(), plan.device, changed); !error.empty())
+                return Fail(message, "the imported constraints do not fit: " + error);
+            Tcl_Obj* answer = DictBuilder()
+                                  .Add("blocks", read.blocks.size())
+                                  .Add("prohibited", read.prohibited.size())
+                                  .Add("ports", read.ports.size())
+                                  .Take();
+            if (!Answer(answer, result, message)) return 0;
+            plan.constraints = std::move(changed);
+            plan.modified = true;
+            return 1;
+        });
     }
 
     RESULT export_(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result,
                    Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        std::vector<std::string> written;
-        for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
-            std::ofstream out(file, std::ios::binary | std::ios::trunc);
-            out << FormatConstraints(form, plan->constraints, state->CurrentDesign()->name);
-            out.close();
-            if (!out) return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "'");
-            written.push_back(file);
-        }
-        if (written.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
-        return Answer(NewList(written), result, message);
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            std::vector<std::string> written;
+            for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
+                std::ofstream out(file, std::ios::binary | std::ios::trunc);
+                out << FormatConstraints(form, plan.constraints, state.CurrentDesign()->name);
+                out.close();
+                if (!out)
+                    return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "'");
+                written.push_back(file);
+            }
+            if (written.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
+            return Answer(NewList(written), result, message);
+        });
     }
 
     RESULT group(const Str& block, const Prop& cells, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        const std::string name = block.c_str();
-        if (name.empty() || name.find_first_of(" \t\n") != std::string::npos)
-            return Fail(message, "a block name must be one word, not '" + name + "'");
-        std::vector<std::string> names;
-        std::string error;
-        TclValue value = ValueOf(cells);
-        if (!value || !ResolveObjects(*state, value.get(), names, error)) return Fail(message, error);
-        if (names.empty()) return Fail(message, "block " + Quote(name) + " needs at least one cell");
-        const Design& design = *state->CurrentDesign();
-        FloorplanConstraints changed = plan->constraints;
-        auto it =
-            std::find_if(changed.blocks.begin(), changed.blocks.end(), [&](const Block& b) { return b.name == name; });
-        if (it == changed.blocks.end()) {
-            changed.blocks.push_back(Block{});
-            it = std::prev(changed.blocks.end());
-            it->name = name;
-        }
-        for (const std::string& cell : names) {
-            if (!design.FindCell(cell)) return Fail(message, Quote(cell) + " is no cell");
-            for (const Block& other : changed.blocks)
-                if (other.name != name && std::find(other.cells.begin(), other.cells.end(), cell) != other.cells.end())
-                    return Fail(message, "cell " + Quote(cell) + " is in block " + Quote(other.name) + " already");
-            if (std::find(it->cells.begin(), it->cells.end(), cell) == it->cells.end()) it->cells.push_back(cell);
-        }
-        if (!Answer(NewList(it->cells), result, message)) return 0;
-        Keep(*plan, std::move(changed));
-        return 1;
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            const std::string name = block.c_str();
+            if (name.empty() || name.find_first_of(" \t\n") != std::string::npos)
+                return Fail(message, "a block name must be one word, not '" + name + "'");
+            std::vector<std::string> names;
+            std::string error;
+            TclValue value = ValueOf(cells);
+            if (!value || !ResolveObjects(state, value.get(), names, error)) return Fail(message, error);
+            if (names.empty()) return Fail(message, "block " + Quote(name) + " needs at least one cell");
+            const Design& design = *state.CurrentDesign();
+            FloorplanConstraints changed = plan.constraints;
+            auto it = std::find_if(changed.blocks.begin(), changed.blocks.end(),
+                                   [&](const Block& b) { return b.name == name; });
+            if (it == changed.blocks.end()) {
+                changed.blocks.push_back(Block{});
+                it = std::prev(changed.blocks.end());
+                it->name = name;
+            }
+            for (const std::string& cell : names) {
+                if (!design.FindCell(cell)) return Fail(message, Quote(cell) + " is no cell");
+                for (const Block& other : changed.blocks)
+                    if (other.name != name &&
+                        std::find(other.cells.begin(), other.cells.end(), cell) != other.cells.end())
+                        return Fail(message, "cell " + Quote(cell) + " is in block " + Quote(other.name) + " already");
+                if (std::find(it->cells.begin(), it->cells.end(), cell) == it->cells.end()) it->cells.push_back(cell);
+            }
+            if (!Answer(NewList(it->cells), result, message)) return 0;
+            Keep(plan, std::move(changed));
+            return 1;
+        });
     }
 
     RESULT ungroup(const Prop& block, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        std::vector<std::string> names;
-        if (!BlockNames(*plan, block, names, message)) return 0;
-        FloorplanConstraints changed = plan->constraints;
-        std::erase_if(changed.blocks, [&names](const Block& b) {
-            return std::find(names.begin(), names.end(), b.name) != names.end();
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            std::vector<std::string> names;
+            if (!BlockNames(plan, block, names, message)) return 0;
+            FloorplanConstraints changed = plan.constraints;
+            std::erase_if(changed.blocks, [&names](const Block& b) {
+                return std::find(names.begin(), names.end(), b.name) != names.end();
+            });
+            if (!Answer(NewList(BlockList(changed)), result, message)) return 0;
+            Keep(plan, std::move(changed));
+            return 1;
         });
-        if (!Answer(NewList(BlockList(changed)), result, message)) return 0;
-        Keep(*plan, std::move(changed));
-        return 1;
     }
 
     RESULT properties(Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        DictBuilder d;
-        for (const std::string& key : kFloorplanProperties) d.Add(key, FloorplanProperty(*state, *plan, key));
-        return Answer(d.Take(), result, message);
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            DictBuilder d;
+            for (const std::string& key : kFloorplanProperties) d.Add(key, FloorplanProperty(state, plan, key));
+            return Answer(d.Take(), result, message);
+        });
     }
 
     RESULT get(const Str& name, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        const std::string key = name.c_str();
-        if (key == "open") return Answer(NewBool(Plan(*state).open), result, message);
-        if (std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) == kFloorplanProperties.end())
-            return Unknown(key, message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        return Answer(FloorplanProperty(*state, *plan, key), result, message);
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            const std::string key = name.c_str();
+            if (key == "open") return Answer(NewBool(Plan(state).open), result, message);
+            if (std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) == kFloorplanProperties.end())
+                return Unknown(key, message);
+            FloorplanData* plan = Ready(state, message);
+            if (!plan) return 0;
+            return Answer(FloorplanProperty(state, *plan, key), result, message);
+        });
     }
 
     RESULT set(const Str& name, const Str& value, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        const std::string key = name.c_str(), text = value.c_str();
-        if (std::find(kWritable.begin(), kWritable.end(), key) == kWritable.end()) {
-            if (key == "open" ||
-                std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) != kFloorplanProperties.end())
-                return Fail(message, "the floorplan setting '" + key + "' is read-only");
-            return Unknown(key, message);
-        }
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        FloorplanData changed = *plan;
-        int number = 0;
-        if (key == "name") {
-            if (text.empty()) return Fail(message, "the floorplan needs a name");
-            changed.name = text;
-        } else if (key == "site_capacity") {
-            if (!WholeNumber(text, 1, 1000000, number))
-                return Fail(message, "the site capacity must be a whole number from 1, not '" + text + "'");
-            changed.device.siteCapacity = number;
-        } else if (key == "clock_limit") {
-            if (!WholeNumber(text, 0, 1000000, number))
-                return Fail(message, "the clock limit must be a whole number of at least 0, not '" + text + "'");
-            changed.clockLimit = number;
-        } else if (WholeNumber(text, 0, 1000000, number)) {
-            for (Bank& b : changed.device.banks) b.ssoLimit = number;
-        } else {
-            // A dict of bank and limit sets the named banks only.
-            const auto words = Words(text);
-            if (words.empty() || words.size() % 2 != 0)
-                return Fail(message, "the sso limit is a whole number for every bank, or a dict of bank and number");
-            for (std::size_t i = 0; i < words.size(); i += 2) {
-                auto bank = std::find_if(changed.device.banks.begin(), changed.device.banks.end(),
-                                         [&](const Bank& b) { return b.name == words[i]; });
-                if (bank == changed.device.banks.end())
-                    return Fail(message, Quote(words[i]) + " is no bank of the device");
-                if (!WholeNumber(words[i + 1], 0, 1000000, bank->ssoLimit))
-                    return Fail(message, "the sso limit of " + Quote(words[i]) +
-                                             " must be a whole number of at least 0, not '" + words[i + 1] + "'");
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            const std::string key = name.c_str(), text = value.c_str();
+            if (std::find(kWritable.begin(), kWritable.end(), key) == kWritable.end()) {
+                if (key == "open" || std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) !=
+                                         kFloorplanProperties.end())
+                    return Fail(message, "the floorplan setting '" + key + "' is read-only");
+                return Unknown(key, message);
             }
-        }
-        if (!Answer(FloorplanProperty(*state, changed, key), result, message)) return 0;
-        changed.modified = true;
-        *plan = std::move(changed);
-        return 1;
+            FloorplanData* plan = Ready(state, message);
+            if (!plan) return 0;
+            FloorplanData changed = *plan;
+            int number = 0;
+            if (key == "name") {
+                if (text.empty()) return Fail(message, "the floorplan needs a name");
+                changed.name = text;
+            } else if (key == "site_capacity") {
+                if (!WholeNumber(text, 1, 1000000, number))
+                    return Fail(message, "the site capacity must be a whole number from 1, not '" + text + "'");
+                changed.device.siteCapacity = number;
+            } else if (key == "clock_limit") {
+                if (!WholeNumber(text, 0, 1000000, number))
+                    return Fail(message, "the clock limit must be a whole number of at least 0, not '" + text + "'");
+                changed.clockLimit = number;
+            } else if (WholeNumber(text, 0, 1000000, number)) {
+                for (Bank& b : changed.device.banks) b.ssoLimit = number;
+            } else {
+                // A dict of bank and limit sets the named banks only.
+                const auto words = Words(text);
+                if (words.empty() || words.size() % 2 != 0)
+                    return Fail(message,
+                                "the sso limit is a whole number for every bank, or a dict of bank and number");
+                for (std::size_t i = 0; i < words.size(); i += 2) {
+                    auto bank = std::find_if(changed.device.banks.begin(), changed.device.banks.end(),
+                                             [&](const Bank& b) { return b.name == words[i]; });
+                    if (bank == changed.device.banks.end())
+                        return Fail(message, Quote(words[i]) + " is no bank of the device");
+                    if (!WholeNumber(words[i + 1], 0, 1000000, bank->ssoLimit))
+                        return Fail(message, "the sso limit of " + Quote(words[i]) +
+                                                 " must be a whole number of at least 0, not '" + words[i + 1] + "'");
+                }
+            }
+            if (!Answer(FloorplanProperty(state, changed, key), result, message)) return 0;
+            changed.modified = true;
+            *plan = std::move(changed);
+            return 1;
+        });
     }
 
     RESULT block_properties(Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        DictBuilder d;
-        for (const Block& b : plan->constraints.blocks) d.Add(b.name, BlockValue(*plan, b));
-        return Answer(d.Take(), result, message);
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            DictBuilder d;
+            for (const Block& b : plan.constraints.blocks) d.Add(b.name, BlockValue(plan, b));
+            return Answer(d.Take(), result, message);
+        });
     }
 
     RESULT block_get(const Prop& block, const Str& name, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        std::vector<std::string> names;
-        if (!BlockNames(*plan, block, names, message)) return 0;
-        const std::string key = name.c_str();
-        const bool builtIn = std::find(kBlockProperties.begin(), kBlockProperties.end(), key) != kBlockProperties.end();
-        for (const std::string& n : names)
-            if (!builtIn && !FindBlock(*plan, n)->constraints.count(key))
-                return Fail(message, "block " + Quote(n) + " has no property or constraint " + Quote(key) +
-                                         "; its properties are " + Join(kBlockProperties));
-        auto valueOf = [&](const std::string& n) {
-            const Block& b = *FindBlock(*plan, n);
-            return builtIn ? BlockProperty(*plan, b, key) : NewText(b.constraints.at(key));
-        };
-        if (names.size() == 1) return Answer(valueOf(names.front()), result, message);
-        DictBuilder several;
-        for (const std::string& n : names) several.Add(n, valueOf(n));
-        return Answer(several.Take(), result, message);
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            std::vector<std::string> names;
+            if (!BlockNames(plan, block, names, message)) return 0;
+            const std::string key = name.c_str();
+            const bool builtIn =
+                std::find(kBlockProperties.begin(), kBlockProperties.end(), key) != kBlockProperties.end();
+            for (const std::string& n : names)
+                if (!builtIn && !FindBlock(plan, n)->constraints.count(key))
+                    return Fail(message, "block " + Quote(n) + " has no property or constraint " + Quote(key) +
+                                             "; its properties are " + Join(kBlockProperties));
+            auto valueOf = [&](const std::string& n) {
+                const Block& b = *FindBlock(plan, n);
+                return builtIn ? BlockProperty(plan, b, key) : NewText(b.constraints.at(key));
+            };
+            if (names.size() == 1) return Answer(valueOf(names.front()), result, message);
+            DictBuilder several;
+            for (const std::string& n : names) several.Add(n, valueOf(n));
+            return Answer(several.Take(), result, message);
+        });
     }
 
     RESULT block_set_constraint(const Prop& block, const Str& name, const Str& value, Out& result,
                                 Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        std::vector<std::string> names;
-        if (!BlockNames(*plan, block, names, message)) return 0;
-        const std::string key = name.c_str(), text = value.c_str();
-        if (std::string problem = CheckBlockConstraint(key, text); !problem.empty()) return Fail(message, problem);
-        FloorplanConstraints changed = plan->constraints;
-        for (Block& b : changed.blocks) {
-            if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
-            if (key == "region") {
-                Region r;
-                std::string ignored;
-                ParseRegion(text, r, ignored);
-                SetRegion(b, r);
-            } else {
-                b.constraints[key] = key == "capacity" ? std::to_string(std::strtoll(text.c_str(), nullptr, 10)) : text;
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            std::vector<std::string> names;
+            if (!BlockNames(plan, block, names, message)) return 0;
+            const std::string key = name.c_str(), text = value.c_str();
+            if (std::string problem = CheckBlockConstraint(key, text); !problem.empty()) return Fail(message, problem);
+            FloorplanConstraints changed = plan.constraints;
+            for (Block& b : changed.blocks) {
+                if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
+                if (key == "region") {
+                    Region r;
+                    std::string ignored;
+                    ParseRegion(text, r, ignored);
+                    SetRegion(b, r);
+                } else {
+                    b.constraints[key] =
+                        key == "capacity" ? std::to_string(std::strtoll(text.c_str(), nullptr, 10)) : text;
+                }
             }
-        }
-        return AnswerBlocks(*plan, std::move(changed), names, result, message);
+            return AnswerBlocks(plan, std::move(changed), names, result, message);
+        });
     }
 
     RESULT block_delete_constraint(const Prop& block, const Str& name, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        std::vector<std::string> names;
-        if (!BlockNames(*plan, block, names, message)) return 0;
-        const std::string key = name.c_str();
-        FloorplanConstraints changed = plan->constraints;
-        for (Block& b : changed.blocks) {
-            if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
-            const bool had = key == "region" ? RegionOf(b).has_value() : b.constraints.erase(key) > 0;
-            if (!had) return Fail(message, "block " + Quote(b.name) + " has no constraint " + Quote(key));
-            if (key == "region") SetRegion(b, std::nullopt);
-        }
-        return AnswerBlocks(*plan, std::move(changed), names, result, message);
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            std::vector<std::string> names;
+            if (!BlockNames(plan, block, names, message)) return 0;
+            const std::string key = name.c_str();
+            FloorplanConstraints changed = plan.constraints;
+            for (Block& b : changed.blocks) {
+                if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
+                const bool had = key == "region" ? RegionOf(b).has_value() : b.constraints.erase(key) > 0;
+                if (!had) return Fail(message, "block " + Quote(b.name) + " has no constraint " + Quote(key));
+                if (key == "region") SetRegion(b, std::nullopt);
+            }
+            return AnswerBlocks(plan, std::move(changed), names, result, message);
+        });
     }
 
     RESULT prohibit(const Prop& sites, Out& result, Msg& message) override {
@@ -470,163 +457,172 @@ public:
     }
 
     RESULT drc(Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-        for (const DrcFinding& f : RunDrc(*state->CurrentDesign(), *plan))
-            Tcl_ListObjAppendElement(
-                nullptr, list,
-                DictBuilder().Add("rule", f.rule).Add("objects", NewList(f.objects)).Add("message", f.message).Take());
-        return Answer(list, result, message);
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+            for (const DrcFinding& f : RunDrc(*state.CurrentDesign(), plan))
+                Tcl_ListObjAppendElement(nullptr, list,
+                                         DictBuilder()
+                                             .Add("rule", f.rule)
+                                             .Add("objects", NewList(f.objects))
+                                             .Add("message", f.message)
+                                             .Take());
+            return Answer(list, result, message);
+        });
     }
 
     RESULT sso_analysis(Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-        for (const SsoBank& b : RunSso(*state->CurrentDesign(), *plan)) {
-            const bool over = b.limit > 0 && static_cast<int>(b.outputs.size()) > b.limit;
-            Tcl_ListObjAppendElement(nullptr, list,
-                                     DictBuilder()
-                                         .Add("bank", b.bank)
-                                         .Add("outputs", b.outputs.size())
-                                         .Add("limit", b.limit)
-                                         .Add("status", over ? "over" : "ok")
-                                         .Add("ports", NewList(b.outputs))
-                                         .Take());
-        }
-        return Answer(list, result, message);
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+            for (const SsoBank& b : RunSso(*state.CurrentDesign(), plan)) {
+                const bool over = b.limit > 0 && static_cast<int>(b.outputs.size()) > b.limit;
+                Tcl_ListObjAppendElement(nullptr, list,
+                                         DictBuilder()
+                                             .Add("bank", b.bank)
+                                             .Add("outputs", b.outputs.size())
+                                             .Add("limit", b.limit)
+                                             .Add("status", over ? "over" : "ok")
+                                             .Add("ports", NewList(b.outputs))
+                                             .Take());
+            }
+            return Answer(list, result, message);
+        });
     }
 
     RESULT clock_analysis(Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-        for (const ClockRegion& r : RunClockAnalysis(*state->CurrentDesign(), *plan)) {
-            const bool over = plan->clockLimit > 0 && static_cast<int>(r.nets.size()) > plan->clockLimit;
-            Tcl_ListObjAppendElement(nullptr, list,
-                                     DictBuilder()
-                                         .Add("block", r.block)
-                                         .Add("region", RegionText(r.region))
-                                         .Add("nets", NewList(r.nets))
-                                         .Add("count", r.nets.size())
-                                         .Add("limit", plan->clockLimit)
-                                         .Add("status", over ? "over" : "ok")
-                                         .Take());
-        }
-        return Answer(list, result, message);
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+            for (const ClockRegion& r : RunClockAnalysis(*state.CurrentDesign(), plan)) {
+                const bool over = plan.clockLimit > 0 && static_cast<int>(r.nets.size()) > plan.clockLimit;
+                Tcl_ListObjAppendElement(nullptr, list,
+                                         DictBuilder()
+                                             .Add("block", r.block)
+                                             .Add("region", RegionText(r.region))
+                                             .Add("nets", NewList(r.nets))
+                                             .Add("count", r.nets.size())
+                                             .Add("limit", plan.clockLimit)
+                                             .Add("status", over ? "over" : "ok")
+                                             .Take());
+            }
+            return Answer(list, result, message);
+        });
     }
 
     RESULT make_pin_compatible(const Str& s1, const Str& s2, const Str& s3, const Str& s4, Out& result,
                                Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        const auto from = Words(s1.c_str()), to = Words(s2.c_str()), offset = Words(s3.c_str());
-        const std::string mode = s4.c_str();
-        if (mode != "copy" && mode != "swap") return Fail(message, "unknown mode '" + mode + "': use copy or swap");
-        if (from.empty() || from.size() != to.size())
-            return Fail(message, "the two port lists must be of the same length, and not empty");
-        int dx = 0, dy = 0;
-        if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -100000, 100000, dx) ||
-                                !WholeNumber(offset[1], -100000, 100000, dy)))
-            return Fail(message, "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
-        if (mode == "swap" && (dx != 0 || dy != 0))
-            return Fail(message, "swap moves no pin by an offset: give \"0 0\"");
-        const Design& design = *state->CurrentDesign();
-        std::set<std::string> seen;
-        for (const std::string& p : from) seen.insert(p);
-        for (const std::string& p : to)
-            if (!seen.insert(p).second) return Fail(message, "port " + Quote(p) + " is named twice");
-        auto sites = plan->constraints.ports;
-        DictBuilder moved;
-        for (std::size_t i = 0; i < from.size(); ++i) {
-            for (const std::string* p : {&from[i], &to[i]})
-                if (!design.FindPort(*p)) return Fail(message, Quote(*p) + " is no port of the design");
-            const auto source = plan->constraints.ports.find(from[i]);
-            if (source == plan->constraints.ports.end())
-                return Fail(message, "port " + Quote(from[i]) + " is not placed");
-            if (mode == "swap") {
-                const auto target = plan->constraints.ports.find(to[i]);
-                if (target == plan->constraints.ports.end())
-                    return Fail(message, "port " + Quote(to[i]) + " is not placed");
-                sites[to[i]] = source->second;
-                sites[from[i]] = target->second;
-                continue;
-            }
-            int x = 0, y = 0;
-            ParseSiteName(source->second, x, y);
-            if (!plan->device.OnDevice(x + dx, y + dy))
-                return Fail(message, "port " + Quote(to[i]) + " would leave the device: " + source->second +
-                                         " moved by " + std::to_string(dx) + " " + std::to_string(dy));
-            sites[to[i]] = Device::SiteName(x + dx, y + dy);
-        }
-        std::map<std::string, std::string> holder;  // site -> port
-        for (const auto& [port, site] : sites) {
-            auto [it, fresh] = holder.emplace(site, port);
-            if (!fresh)
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            const auto from = Words(s1.c_str()), to = Words(s2.c_str()), offset = Words(s3.c_str());
+            const std::string mode = s4.c_str();
+            if (mode != "copy" && mode != "swap") return Fail(message, "unknown mode '" + mode + "': use copy or swap");
+            if (from.empty() || from.size() != to.size())
+                return Fail(message, "the two port lists must be of the same length, and not empty");
+            int dx = 0, dy = 0;
+            if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -100000, 100000, dx) ||
+                                    !WholeNumber(offset[1], -100000, 100000, dy)))
                 return Fail(message,
-                            "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
-            const auto before = plan->constraints.ports.find(port);
-            const bool changed = before == plan->constraints.ports.end() || before->second != site;
-            if (changed && plan->constraints.prohibited.count(site))
-                return Fail(message, "port " + Quote(port) + " would be placed on the prohibited site " + site);
-            if (changed) moved.Add(port, site);
-        }
-        if (!Answer(moved.Take(), result, message)) return 0;
-        plan->constraints.ports = std::move(sites);
-        plan->modified = true;
-        return 1;
+                            "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
+            if (mode == "swap" && (dx != 0 || dy != 0))
+                return Fail(message, "swap moves no pin by an offset: give \"0 0\"");
+            const Design& design = *state.CurrentDesign();
+            std::set<std::string> seen;
+            for (const std::string& p : from) seen.insert(p);
+            for (const std::string& p : to)
+                if (!seen.insert(p).second) return Fail(message, "port " + Quote(p) + " is named twice");
+            auto sites = plan.constraints.ports;
+            DictBuilder moved;
+            for (std::size_t i = 0; i < from.size(); ++i) {
+                for (const std::string* p : {&from[i], &to[i]})
+                    if (!design.FindPort(*p)) return Fail(message, Quote(*p) + " is no port of the design");
+                const auto source = plan.constraints.ports.find(from[i]);
+                if (source == plan.constraints.ports.end())
+                    return Fail(message, "port " + Quote(from[i]) + " is not placed");
+                if (mode == "swap") {
+                    const auto target = plan.constraints.ports.find(to[i]);
+                    if (target == plan.constraints.ports.end())
+                        return Fail(message, "port " + Quote(to[i]) + " is not placed");
+                    sites[to[i]] = source->second;
+                    sites[from[i]] = target->second;
+                    continue;
+                }
+                int x = 0, y = 0;
+                ParseSiteName(source->second, x, y);
+                if (!plan.device.OnDevice(x + dx, y + dy))
+                    return Fail(message, "port " + Quote(to[i]) + " would leave the device: " + source->second +
+                                             " moved by " + std::to_string(dx) + " " + std::to_string(dy));
+                sites[to[i]] = Device::SiteName(x + dx, y + dy);
+            }
+            std::map<std::string, std::string> holder;  // site -> port
+            for (const auto& [port, site] : sites) {
+                auto [it, fresh] = holder.emplace(site, port);
+                if (!fresh)
+                    return Fail(message,
+                                "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
+                const auto before = plan.constraints.ports.find(port);
+                const bool changed = before == plan.constraints.ports.end() || before->second != site;
+                if (changed && plan.constraints.prohibited.count(site))
+                    return Fail(message, "port " + Quote(port) + " would be placed on the prohibited site " + site);
+                if (changed) moved.Add(port, site);
+            }
+            if (!Answer(moved.Take(), result, message)) return 0;
+            plan.constraints.ports = std::move(sites);
+            plan.modified = true;
+            return 1;
+        });
     }
 
     RESULT zoom(const Str& left, const Str& right, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        const std::string a = left.c_str(), b = right.c_str();
-        Region view;
-        if (a == "fit") {
-            view = WholeDevice(plan->device);
-        } else if (a == "block") {
-            const Block* block = FindBlock(*plan, b);
-            if (!block) return Fail(message, "no block named " + Quote(b));
-            const auto region = RegionOf(*block);
-            if (!region) return Fail(message, "block " + Quote(b) + " has no region to show");
-            view = ClampToDevice(*region, plan->device);
-        } else {
-            const auto p = plan->device.ParseSite(a), q = plan->device.ParseSite(b);
-            if (!p || !q)
-                return Fail(message,
-                            "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
-            view = Region{std::min(p->x, q->x), std::min(p->y, q->y), std::max(p->x, q->x), std::max(p->y, q->y)};
-        }
-        if (!Answer(ViewValue(*plan, view), result, message)) return 0;
-        plan->view = view;
-        return 1;
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            const std::string a = left.c_str(), b = right.c_str();
+            Region view;
+            if (a == "fit") {
+                view = WholeDevice(plan.device);
+            } else if (a == "block") {
+                const Block* block = FindBlock(plan, b);
+                if (!block) return Fail(message, "no block named " + Quote(b));
+                const auto region = RegionOf(*block);
+                if (!region) return Fail(message, "block " + Quote(b) + " has no region to show");
+                view = ClampToDevice(*region, plan.device);
+            } else {
+                const auto p = plan.device.ParseSite(a), q = plan.device.ParseSite(b);
+                if (!p || !q)
+                    return Fail(message,
+                                "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
+                view = Region{std::min(p->x, q->x), std::min(p->y, q->y), std::max(p->x, q->x), std::max(p->y, q->y)};
+            }
+            if (!Answer(ViewValue(plan, view), result, message)) return 0;
+            plan.view = view;
+            return 1;
+        });
     }
 
     RESULT refresh(Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        // The device may have changed under the view; what no longer lies on it is dropped.
-        Region view = ClampToDevice(plan->view, plan->device);
-        if (!Answer(ViewValue(*plan, view), result, message)) return 0;
-        plan->view = view;
-        return 1;
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            // The device may have changed under the view; what no longer lies on it is dropped.
+            Region view = ClampToDevice(plan.view, plan.device);
+            if (!Answer(ViewValue(plan, view), result, message)) return 0;
+            plan.view = view;
+            return 1;
+        });
     }
 
 private:
     static RESULT Gone(Msg& message) { return Fail(message, "the tool state of this interpreter is gone"); }
+
+    // Runs `op` on the tool state, while the interpreter still has one.
+    template <class Op>
+    RESULT OnState(Msg& message, Op op) {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        return op(*state);
+    }
+
+    // Runs `op` on the open floorplan, when it belongs to the current design (Ready).
+    template <class Op>
+    RESULT OnPlan(Msg& message, Op op) {
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            FloorplanData* plan = Ready(state, message);
+            return plan ? op(state, *plan) : 0;
+        });
+    }
 
     static FloorplanData& Plan(ToolState& state) {
         if (!state.floorplan) state.floorplan = std::make_shared<FloorplanData>();
@@ -788,37 +784,35 @@ private:
     }
 
     RESULT SwitchSites(const Prop& sites, bool prohibit, Out& result, Msg& message) {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        FloorplanData* plan = Ready(*state, message);
-        if (!plan) return 0;
-        std::vector<std::string> words;
-        if (!WordsOf(sites, words)) return Fail(message, "the sites are no proper list");
-        if (words.empty()) return Fail(message, "no site given");
-        std::set<std::string> changed = plan->constraints.prohibited;
-        for (const std::string& w : words) {
-            Region r;
-            std::string error;
-            const bool range = w.find(':') != std::string::npos;
-            int x = 0, y = 0;
-            if (range ? !ParseRegion(w, r, error) : !ParseSiteName(w, x, y))
-                return Fail(message, Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
-            if (!range) r = Region{x, y, x, y};
-            if (!plan->device.OnDevice(r.x0, r.y0) || !plan->device.OnDevice(r.x1, r.y1))
-                return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan->device.columns) +
-                                         " x " + std::to_string(plan->device.rows) + " sites)");
-            for (int yy = r.y0; yy <= r.y1; ++yy)
-                for (int xx = r.x0; xx <= r.x1; ++xx) {
-                    if (prohibit)
-                        changed.insert(Device::SiteName(xx, yy));
-                    else
-                        changed.erase(Device::SiteName(xx, yy));
-                }
-        }
-        if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
-        plan->constraints.prohibited = std::move(changed);
-        plan->modified = true;
-        return 1;
+        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+            std::vector<std::string> words;
+            if (!WordsOf(sites, words)) return Fail(message, "the sites are no proper list");
+            if (words.empty()) return Fail(message, "no site given");
+            std::set<std::string> changed = plan.constraints.prohibited;
+            for (const std::string& w : words) {
+                Region r;
+                std::string error;
+                const bool range = w.find(':') != std::string::npos;
+                int x = 0, y = 0;
+                if (range ? !ParseRegion(w, r, error) : !ParseSiteName(w, x, y))
+                    return Fail(message, Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
+                if (!range) r = Region{x, y, x, y};
+                if (!plan.device.OnDevice(r.x0, r.y0) || !plan.device.OnDevice(r.x1, r.y1))
+                    return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan.device.columns) +
+                                             " x " + std::to_string(plan.device.rows) + " sites)");
+                for (int yy = r.y0; yy <= r.y1; ++yy)
+                    for (int xx = r.x0; xx <= r.x1; ++xx) {
+                        if (prohibit)
+                            changed.insert(Device::SiteName(xx, yy));
+                        else
+                            changed.erase(Device::SiteName(xx, yy));
+                    }
+            }
+            if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
+            plan.constraints.prohibited = std::move(changed);
+            plan.modified = true;
+            return 1;
+        });
     }
 
     std::weak_ptr<ToolState> m_state;  // the interpreter owns the state; this object may outlive it
