@@ -198,36 +198,36 @@ public:
     explicit TimingAnalysis(const StatePtr& state) : m_state(state) {}
 
     RESULT properties(bool descriptors, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        if (!descriptors) {
-            std::vector<std::string> ids;
-            for (const auto& [id, a] : Data(*state).analyses) ids.push_back(id);
-            return Answer(NewList(ids), result, message);
-        }
-        Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-        for (const Descriptor& d : kSettings)
-            Tcl_ListObjAppendElement(nullptr, list,
-                                     DictBuilder()
-                                         .Add("name", d.name)
-                                         .Add("type", d.type)
-                                         .Add("access", d.writable ? "read-write" : "read-only")
-                                         .Add("description", d.description)
-                                         .Take());
-        return Answer(list, result, message);
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            if (!descriptors) {
+                std::vector<std::string> ids;
+                for (const auto& [id, a] : Data(state).analyses) ids.push_back(id);
+                return Answer(NewList(ids), result, message);
+            }
+            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+            for (const Descriptor& d : kSettings)
+                Tcl_ListObjAppendElement(nullptr, list,
+                                         DictBuilder()
+                                             .Add("name", d.name)
+                                             .Add("type", d.type)
+                                             .Add("access", d.writable ? "read-write" : "read-only")
+                                             .Add("description", d.description)
+                                             .Take());
+            return Answer(list, result, message);
+        });
     }
 
     RESULT delete_(const Str& analysis, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        TimingData& data = Data(*state);
-        if (!Find(data, analysis, message)) return 0;
-        std::vector<std::string> left;
-        for (const auto& [id, a] : data.analyses)
-            if (id != analysis.c_str()) left.push_back(id);
-        if (!Answer(NewList(left), result, message)) return 0;
-        data.analyses.erase(analysis.c_str());
-        return 1;
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            TimingData& data = Data(state);
+            if (!Find(data, analysis, message)) return 0;
+            std::vector<std::string> left;
+            for (const auto& [id, a] : data.analyses)
+                if (id != analysis.c_str()) left.push_back(id);
+            if (!Answer(NewList(left), result, message)) return 0;
+            data.analyses.erase(analysis.c_str());
+            return 1;
+        });
     }
 
     RESULT disable_constraints(const Str& analysis, const List& constraints, Out& result, Msg& message) override {
@@ -243,14 +243,12 @@ public:
     }
 
     RESULT get(const Str& analysis, const Str& name, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        const Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const std::string key = name.c_str();
-        for (const Descriptor& d : kSettings)
-            if (key == d.name) return Answer(d.value(*state, *a), result, message);
-        return UnknownSetting(key, message);
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            const std::string key = name.c_str();
+            for (const Descriptor& d : kSettings)
+                if (key == d.name) return Answer(d.value(state, a), result, message);
+            return UnknownSetting(key, message);
+        });
     }
 
     RESULT enable_cpt(const Str& analysis, const Str& kind, const List& items, Out& result, Msg& message) override {
@@ -258,55 +256,51 @@ public:
     }
 
     RESULT new_(const Str& analysis, const Str& name, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        const std::string id = analysis.c_str();
-        if (id.empty() || id.find_first_of(" \t\n") != std::string::npos)
-            return Fail(message, "the name of a timing analysis must be one word, not '" + id + "'");
-        TimingData& data = Data(*state);
-        if (data.analyses.count(id)) return Fail(message, "a timing analysis named '" + id + "' exists already");
-        Analysis a;
-        a.id = id;
-        a.name = name.IsEmpty() ? id : std::string(name.c_str());
-        if (!Answer(NewText(id), result, message)) return 0;
-        data.analyses.emplace(id, std::move(a));
-        return 1;
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            const std::string id = analysis.c_str();
+            if (id.empty() || id.find_first_of(" \t\n") != std::string::npos)
+                return Fail(message, "the name of a timing analysis must be one word, not '" + id + "'");
+            TimingData& data = Data(state);
+            if (data.analyses.count(id)) return Fail(message, "a timing analysis named '" + id + "' exists already");
+            Analysis a;
+            a.id = id;
+            a.name = name.IsEmpty() ? id : std::string(name.c_str());
+            if (!Answer(NewText(id), result, message)) return 0;
+            data.analyses.emplace(id, std::move(a));
+            return 1;
+        });
     }
 
     RESULT reset(const Str& analysis, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        a->settings = TimingSettings{};
-        a->result.reset();
-        return Answer(Settings(*state, *a), result, message);
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            a.settings = TimingSettings{};
+            a.result.reset();
+            return Answer(Settings(state, a), result, message);
+        });
     }
 
     RESULT run(const Str& analysis, bool overwrite, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const Design* design = state->CurrentDesign();
-        if (!design) return Fail(message, kNoProject);
-        if (a->result && !overwrite)
-            return Fail(message, "timing analysis '" + a->id +
-                                     "' has a result already: run it with -overwrite to replace the result");
-        int pathLimit = 0;
-        if (const Setting* s = state->settings.Find("max_paths")) pathLimit = std::atoi(s->value.c_str());
-        TimingResult fresh;
-        std::string error;
-        if (!RunTiming(*design, a->settings, pathLimit, fresh, error))
-            return Fail(message, "timing analysis '" + a->id + "' failed: " + error);
-        fresh.epoch = state->designEpoch;
-        std::optional<TimingResult> previous = std::move(a->result);
-        a->result = std::move(fresh);
-        if (!Answer(PathsValue(*a), result, message)) {
-            a->result = std::move(previous);
-            return 0;
-        }
-        return 1;
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            const Design* design = state.CurrentDesign();
+            if (!design) return Fail(message, kNoProject);
+            if (a.result && !overwrite)
+                return Fail(message, "timing analysis '" + a.id +
+                                         "' has a result already: run it with -overwrite to replace the result");
+            int pathLimit = 0;
+            if (const Setting* s = state.settings.Find("max_paths")) pathLimit = std::atoi(s->value.c_str());
+            TimingResult fresh;
+            std::string error;
+            if (!RunTiming(*design, a.settings, pathLimit, fresh, error))
+                return Fail(message, "timing analysis '" + a.id + "' failed: " + error);
+            fresh.epoch = state.designEpoch;
+            std::optional<TimingResult> previous = std::move(a.result);
+            a.result = std::move(fresh);
+            if (!Answer(PathsValue(a), result, message)) {
+                a.result = std::move(previous);
+                return 0;
+            }
+            return 1;
+        });
     }
 
     RESULT save_as(const Str& analysis, const Str& file, Out& result, Msg& message) override {
@@ -319,134 +313,142 @@ public:
     }
 
     RESULT set(const Str& analysis, const Str& name, const Prop& value, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const std::string key = name.c_str();
-        const std::string text = TextOf(value);
-        std::string* target = key == "name" ? &a->name : key == "description" ? &a->description : nullptr;
-        if (!target) {
-            for (const Descriptor& d : kSettings)
-                if (key == d.name) return Fail(message, "the setting '" + key + "' of a timing analysis is read-only");
-            return UnknownSetting(key, message);
-        }
-        if (key == "name" && text.empty())
-            return Fail(message, "the display name of a timing analysis cannot be empty");
-        if (!Answer(NewText(text), result, message)) return 0;
-        *target = text;
-        return 1;
+        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+            const std::string key = name.c_str();
+            const std::string text = TextOf(value);
+            std::string* target = key == "name" ? &a.name : key == "description" ? &a.description : nullptr;
+            if (!target) {
+                for (const Descriptor& d : kSettings)
+                    if (key == d.name)
+                        return Fail(message, "the setting '" + key + "' of a timing analysis is read-only");
+                return UnknownSetting(key, message);
+            }
+            if (key == "name" && text.empty())
+                return Fail(message, "the display name of a timing analysis cannot be empty");
+            if (!Answer(NewText(text), result, message)) return 0;
+            *target = text;
+            return 1;
+        });
     }
 
     RESULT set_constraint(const Str& analysis, const Str& name, const Prop& value, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const std::string key = name.c_str();
-        const std::string text = TextOf(value);
-        std::string error = CheckConstraint(*state, key, text);
-        if (!error.empty()) return Fail(message, error);
-        TimingSettings changed = a->settings;
-        changed.constraints[key] = TimingSettings::Constraint{text, true};
-        return Commit(*a, std::move(changed), ConstraintsValue, result, message);
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            const std::string key = name.c_str();
+            const std::string text = TextOf(value);
+            std::string error = CheckConstraint(state, key, text);
+            if (!error.empty()) return Fail(message, error);
+            TimingSettings changed = a.settings;
+            changed.constraints[key] = TimingSettings::Constraint{text, true};
+            return Commit(a, std::move(changed), ConstraintsValue, result, message);
+        });
     }
 
     RESULT set_endpoints(const Str& analysis, const Str& kind, const Str& side, const List& endpoints, Out& result,
                          Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const std::string k = kind.c_str(), s = side.c_str();
-        if (k != "from" && k != "to") return Fail(message, "unknown endpoint kind '" + k + "': use from or to");
-        if (s != "only" && s != "except") return Fail(message, "unknown endpoint side '" + s + "': use only or except");
-        std::vector<std::string> items;
-        if (!WordsOf(endpoints, items)) return Fail(message, "the endpoints are no proper list");
-        const Design* design = state->CurrentDesign();
-        if (!design) return Fail(message, kNoProject);
-        for (const std::string& item : items) {
-            const Cell* cell = design->FindCell(item);
-            const IoPort* port = design->FindPort(item);
-            const bool fits = (cell && cell->sequential) || (port && port->output == (k == "to"));
-            if (!fits)
-                return Fail(message, "'" + item + "' is no " + (k == "from" ? "start" : "end") + " point: use " +
-                                         (k == "from" ? "input" : "output") + " ports and sequential cells");
-        }
-        if (items.empty() && s == "only")
-            return Fail(message, "set_endpoints " + k + " only needs at least one endpoint");
-        TimingSettings changed = a->settings;
-        if (items.empty())
-            changed.endpoints.erase(k);
-        else
-            changed.endpoints[k] = TimingSettings::EndpointRule{s, items};
-        return Commit(*a, std::move(changed), EndpointsValue, result, message);
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            const std::string k = kind.c_str(), s = side.c_str();
+            if (k != "from" && k != "to") return Fail(message, "unknown endpoint kind '" + k + "': use from or to");
+            if (s != "only" && s != "except")
+                return Fail(message, "unknown endpoint side '" + s + "': use only or except");
+            std::vector<std::string> items;
+            if (!WordsOf(endpoints, items)) return Fail(message, "the endpoints are no proper list");
+            const Design* design = state.CurrentDesign();
+            if (!design) return Fail(message, kNoProject);
+            for (const std::string& item : items) {
+                const Cell* cell = design->FindCell(item);
+                const IoPort* port = design->FindPort(item);
+                const bool fits = (cell && cell->sequential) || (port && port->output == (k == "to"));
+                if (!fits)
+                    return Fail(message, "'" + item + "' is no " + (k == "from" ? "start" : "end") + " point: use " +
+                                             (k == "from" ? "input" : "output") + " ports and sequential cells");
+            }
+            if (items.empty() && s == "only")
+                return Fail(message, "set_endpoints " + k + " only needs at least one endpoint");
+            TimingSettings changed = a.settings;
+            if (items.empty())
+                changed.endpoints.erase(k);
+            else
+                changed.endpoints[k] = TimingSettings::EndpointRule{s, items};
+            return Commit(a, std::move(changed), EndpointsValue, result, message);
+        });
     }
 
     RESULT set_query(const Str& analysis, const Str& kind, const List& items, int32_t ld, int32_t hf, Out& result,
                      Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const std::string k = kind.c_str();
-        if (k != "paths" && k != "fanout") return Fail(message, "unknown query kind '" + k + "': use paths or fanout");
-        if (ld < 0 || hf < 0) return Fail(message, "-ld and -hf cannot be negative");
-        std::vector<std::string> words;
-        if (!WordsOf(items, words)) return Fail(message, "the query items are no proper list");
-        if (words.empty()) return Fail(message, "a " + k + " query needs at least one item");
-        if (k == "paths") {
-            for (const std::string& w : words)
-                if (w != "*" && std::find(kPathFields.begin(), kPathFields.end(), w) == kPathFields.end())
-                    return Fail(message, "unknown path field '" + w + "': use * or " + Join(kPathFields));
-        } else if (hf < 1) {
-            return Fail(message, "a fanout query needs -hf N, the least fanout it reports");
-        }
-        TimingSettings changed = a->settings;
-        changed.queries[k] = TimingSettings::Query{words, ld, hf};
-        return Commit(*a, std::move(changed), QueriesValue, result, message);
+        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+            const std::string k = kind.c_str();
+            if (k != "paths" && k != "fanout")
+                return Fail(message, "unknown query kind '" + k + "': use paths or fanout");
+            if (ld < 0 || hf < 0) return Fail(message, "-ld and -hf cannot be negative");
+            std::vector<std::string> words;
+            if (!WordsOf(items, words)) return Fail(message, "the query items are no proper list");
+            if (words.empty()) return Fail(message, "a " + k + " query needs at least one item");
+            if (k == "paths") {
+                for (const std::string& w : words)
+                    if (w != "*" && std::find(kPathFields.begin(), kPathFields.end(), w) == kPathFields.end())
+                        return Fail(message, "unknown path field '" + w + "': use * or " + Join(kPathFields));
+            } else if (hf < 1) {
+                return Fail(message, "a fanout query needs -hf N, the least fanout it reports");
+            }
+            TimingSettings changed = a.settings;
+            changed.queries[k] = TimingSettings::Query{words, ld, hf};
+            return Commit(a, std::move(changed), QueriesValue, result, message);
+        });
     }
 
     RESULT set_filter(const Str& analysis, const Str& kind, const Str& mode, const List& items, Out& result,
                       Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const std::string k = kind.c_str(), m = mode.c_str();
-        static const std::vector<std::string> kinds{"startpoint", "endpoint", "clock", "through", "slack"};
-        if (std::find(kinds.begin(), kinds.end(), k) == kinds.end())
-            return Fail(message, "unknown filter kind '" + k + "': use " + Join(kinds));
-        const bool slack = k == "slack";
-        if (m != "clear" && (slack ? m != "below" && m != "above" : m != "include" && m != "exclude"))
-            return Fail(message, "unknown mode '" + m + "' of the " + k + " filter: use " +
-                                     (slack ? "below, above or clear" : "include, exclude or clear"));
-        std::vector<std::string> words;
-        if (!WordsOf(items, words)) return Fail(message, "the filter items are no proper list");
-        TimingSettings changed = a->settings;
-        if (m == "clear") {
-            changed.filters.erase(k);
-        } else {
-            double bound = 0;
-            if (slack && (words.size() != 1 || !IsNumber(words.front(), bound)))
-                return Fail(message, "the slack filter needs one number");
-            if (words.empty()) return Fail(message, "the " + k + " filter needs at least one pattern");
-            if (slack) words.front() = Number(bound);
-            changed.filters[k] = TimingSettings::Filter{m, words};
-        }
-        return Commit(*a, std::move(changed), FiltersValue, result, message);
+        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+            const std::string k = kind.c_str(), m = mode.c_str();
+            static const std::vector<std::string> kinds{"startpoint", "endpoint", "clock", "through", "slack"};
+            if (std::find(kinds.begin(), kinds.end(), k) == kinds.end())
+                return Fail(message, "unknown filter kind '" + k + "': use " + Join(kinds));
+            const bool slack = k == "slack";
+            if (m != "clear" && (slack ? m != "below" && m != "above" : m != "include" && m != "exclude"))
+                return Fail(message, "unknown mode '" + m + "' of the " + k + " filter: use " +
+                                         (slack ? "below, above or clear" : "include, exclude or clear"));
+            std::vector<std::string> words;
+            if (!WordsOf(items, words)) return Fail(message, "the filter items are no proper list");
+            TimingSettings changed = a.settings;
+            if (m == "clear") {
+                changed.filters.erase(k);
+            } else {
+                double bound = 0;
+                if (slack && (words.size() != 1 || !IsNumber(words.front(), bound)))
+                    return Fail(message, "the slack filter needs one number");
+                if (words.empty()) return Fail(message, "the " + k + " filter needs at least one pattern");
+                if (slack) words.front() = Number(bound);
+                changed.filters[k] = TimingSettings::Filter{m, words};
+            }
+            return Commit(a, std::move(changed), FiltersValue, result, message);
+        });
     }
 
     RESULT show_settings(const Str& analysis, Out& result, Msg& message) override {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        const Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        return Answer(Settings(*state, *a), result, message);
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            return Answer(Settings(state, a), result, message);
+        });
     }
 
 private:
     static RESULT Gone(Msg& message) { return Fail(message, "the tool state of this interpreter is gone"); }
+
+    // Runs `op` on the tool state, while the interpreter still has one.
+    template <class Op>
+    RESULT OnState(Msg& message, Op op) {
+        auto state = m_state.lock();
+        if (!state) return Gone(message);
+        return op(*state);
+    }
+
+    // Runs `op` on the named analysis, when there is one (Find).
+    template <class Op>
+    RESULT OnAnalysis(const Str& analysis, Msg& message, Op op) {
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            Analysis* a = Find(Data(state), analysis, message);
+            return a ? op(state, *a) : 0;
+        });
+    }
 
     static TimingData& Data(ToolState& state) {
         if (!state.timing) state.timing = std::make_shared<TimingData>();
@@ -535,84 +537,79 @@ private:
     }
 
     RESULT SwitchConstraints(const Str& analysis, const List& constraints, bool enabled, Out& result, Msg& message) {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        std::vector<std::string> names;
-        if (!WordsOf(constraints, names)) return Fail(message, "the constraint names are no proper list");
-        TimingSettings changed = a->settings;
-        for (const std::string& n : names) {
-            auto it = changed.constraints.find(n);
-            if (it == changed.constraints.end())
-                return Fail(message, "timing analysis '" + a->id + "' has no constraint '" + n + "'");
-            it->second.enabled = enabled;
-        }
-        return Commit(*a, std::move(changed), ConstraintsValue, result, message);
+        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+            std::vector<std::string> names;
+            if (!WordsOf(constraints, names)) return Fail(message, "the constraint names are no proper list");
+            TimingSettings changed = a.settings;
+            for (const std::string& n : names) {
+                auto it = changed.constraints.find(n);
+                if (it == changed.constraints.end())
+                    return Fail(message, "timing analysis '" + a.id + "' has no constraint '" + n + "'");
+                it->second.enabled = enabled;
+            }
+            return Commit(a, std::move(changed), ConstraintsValue, result, message);
+        });
     }
 
     RESULT SwitchCpt(const Str& analysis, const Str& kind, const List& items, bool enabled, Out& result, Msg& message) {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        const std::string k = kind.c_str();
-        const auto objectKind = KindFromWord(k);
-        if (!objectKind || (*objectKind != Kind::Cell && *objectKind != Kind::Port && *objectKind != Kind::Net &&
-                            *objectKind != Kind::Clock))
-            return Fail(message, "unknown kind '" + k + "': use cell, port, net or clock");
-        std::vector<std::string> words;
-        if (!WordsOf(items, words)) return Fail(message, "the items are no proper list");
-        const Design* design = state->CurrentDesign();
-        if (!design) return Fail(message, kNoProject);
-        TimingSettings changed = a->settings;
-        auto& set = changed.disabled[k];
-        for (const std::string& w : words) {
-            const auto ref = design->Find(w);
-            if (!ref || ref->kind != *objectKind) return Fail(message, "'" + w + "' is no " + k + " of the design");
-            if (enabled)
-                set.erase(w);
-            else
-                set.insert(w);
-        }
-        if (set.empty()) changed.disabled.erase(k);
-        return Commit(*a, std::move(changed), CptValue, result, message);
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            const std::string k = kind.c_str();
+            const auto objectKind = KindFromWord(k);
+            if (!objectKind || (*objectKind != Kind::Cell && *objectKind != Kind::Port && *objectKind != Kind::Net &&
+                                *objectKind != Kind::Clock))
+                return Fail(message, "unknown kind '" + k + "': use cell, port, net or clock");
+            std::vector<std::string> words;
+            if (!WordsOf(items, words)) return Fail(message, "the items are no proper list");
+            const Design* design = state.CurrentDesign();
+            if (!design) return Fail(message, kNoProject);
+            TimingSettings changed = a.settings;
+            auto& set = changed.disabled[k];
+            for (const std::string& w : words) {
+                const auto ref = design->Find(w);
+                if (!ref || ref->kind != *objectKind) return Fail(message, "'" + w + "' is no " + k + " of the design");
+                if (enabled)
+                    set.erase(w);
+                else
+                    set.insert(w);
+            }
+            if (set.empty()) changed.disabled.erase(k);
+            return Commit(a, std::move(changed), CptValue, result, message);
+        });
     }
 
     RESULT WriteReport(const Str& analysis, const Str& file, Out& result, Msg& message) {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        const Analysis* a = Find(Data(*state), analysis, message);
-        if (!a) return 0;
-        if (!a->result) return Fail(message, "timing analysis '" + a->id + "' has no result: run it first");
-        const std::string path = file.c_str();
-        if (path.empty()) return Fail(message, "the report needs a file name");
-        std::ostringstream text;
-        const TimingResult& r = *a->result;
-        text << "Timing analysis " << a->id << " (" << a->name << ")\n";
-        if (!a->description.empty()) text << "Description: " << a->description << "\n";
-        text << "Design: " << r.design << "\n";
-        text << "Status: " << Status(*state, *a) << "\n";
-        text << "Endpoints: " << r.endpoints << ", failing: " << r.failing << ", unconstrained: " << r.unconstrained
-             << "\n";
-        text << "Worst slack: " << (r.worstSlack ? Number(*r.worstSlack) : std::string("none")) << "\n";
-        text << "Total negative slack: " << Number(r.totalNegativeSlack) << "\n";
-        for (std::size_t i = 0; i < r.paths.size(); ++i) {
-            const TimingPath& p = r.paths[i];
-            text << "\nPath " << i + 1 << ": " << p.startpoint << " -> " << p.endpoint << ", clock " << p.clock << "\n"
-                 << "  arrival " << Number(p.arrival) << ", required " << Number(p.required) << ", slack "
-                 << Number(p.slack) << "\n"
-                 << "  through " << Join(p.points, " ") << "\n";
-        }
-        if (!r.highFanout.empty()) {
-            text << "\nHigh fanout nets:\n";
-            for (const FanoutNet& n : r.highFanout) text << "  " << n.net << " " << n.fanout << "\n";
-        }
-        std::ofstream out(path, std::ios::binary | std::ios::trunc);
-        out << text.str();
-        out.close();
-        if (!out) return Fail(message, "cannot write the timing report to '" + path + "'");
-        return Answer(NewText(path), result, message);
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
+            if (!a.result) return Fail(message, "timing analysis '" + a.id + "' has no result: run it first");
+            const std::string path = file.c_str();
+            if (path.empty()) return Fail(message, "the report needs a file name");
+            std::ostringstream text;
+            const TimingResult& r = *a.result;
+            text << "Timing analysis " << a.id << " (" << a.name << ")\n";
+            if (!a.description.empty()) text << "Description: " << a.description << "\n";
+            text << "Design: " << r.design << "\n";
+            text << "Status: " << Status(state, a) << "\n";
+            text << "Endpoints: " << r.endpoints << ", failing: " << r.failing << ", unconstrained: " << r.unconstrained
+                 << "\n";
+            text << "Worst slack: " << (r.worstSlack ? Number(*r.worstSlack) : std::string("none")) << "\n";
+            text << "Total negative slack: " << Number(r.totalNegativeSlack) << "\n";
+            for (std::size_t i = 0; i < r.paths.size(); ++i) {
+                const TimingPath& p = r.paths[i];
+                text << "\nPath " << i + 1 << ": " << p.startpoint << " -> " << p.endpoint << ", clock " << p.clock
+                     << "\n"
+                     << "  arrival " << Number(p.arrival) << ", required " << Number(p.required) << ", slack "
+                     << Number(p.slack) << "\n"
+                     << "  through " << Join(p.points, " ") << "\n";
+            }
+            if (!r.highFanout.empty()) {
+                text << "\nHigh fanout nets:\n";
+                for (const FanoutNet& n : r.highFanout) text << "  " << n.net << " " << n.fanout << "\n";
+            }
+            std::ofstream out(path, std::ios::binary | std::ios::trunc);
+            out << text.str();
+            out.close();
+            if (!out) return Fail(message, "cannot write the timing report to '" + path + "'");
+            return Answer(NewText(path), result, message);
+        });
     }
 
     std::weak_ptr<ToolState> m_state;  // the interpreter owns the state; this object may outlive it
