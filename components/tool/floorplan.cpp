@@ -456,55 +456,12 @@ public:
         return SwitchSites(sites, false, result, message);
     }
 
-    RESULT drc(Out& result, Msg& message) override {
-        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
-            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-            for (const DrcFinding& f : RunDrc(*state.CurrentDesign(), plan))
-                Tcl_ListObjAppendElement(nullptr, list,
-                                         DictBuilder()
-                                             .Add("rule", f.rule)
-                                             .Add("objects", NewList(f.objects))
-                                             .Add("message", f.message)
-                                             .Take());
-            return Answer(list, result, message);
-        });
-    }
+    RESULT drc(Out& result, Msg& message) override { return Analyse(RunDrc, FindingValue, result, message); }
 
-    RESULT sso_analysis(Out& result, Msg& message) override {
-        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
-            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-            for (const SsoBank& b : RunSso(*state.CurrentDesign(), plan)) {
-                const bool over = b.limit > 0 && static_cast<int>(b.outputs.size()) > b.limit;
-                Tcl_ListObjAppendElement(nullptr, list,
-                                         DictBuilder()
-                                             .Add("bank", b.bank)
-                                             .Add("outputs", b.outputs.size())
-                                             .Add("limit", b.limit)
-                                             .Add("status", over ? "over" : "ok")
-                                             .Add("ports", NewList(b.outputs))
-                                             .Take());
-            }
-            return Answer(list, result, message);
-        });
-    }
+    RESULT sso_analysis(Out& result, Msg& message) override { return Analyse(RunSso, SsoBankValue, result, message); }
 
     RESULT clock_analysis(Out& result, Msg& message) override {
-        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
-            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-            for (const ClockRegion& r : RunClockAnalysis(*state.CurrentDesign(), plan)) {
-                const bool over = plan.clockLimit > 0 && static_cast<int>(r.nets.size()) > plan.clockLimit;
-                Tcl_ListObjAppendElement(nullptr, list,
-                                         DictBuilder()
-                                             .Add("block", r.block)
-                                             .Add("region", RegionText(r.region))
-                                             .Add("nets", NewList(r.nets))
-                                             .Add("count", r.nets.size())
-                                             .Add("limit", plan.clockLimit)
-                                             .Add("status", over ? "over" : "ok")
-                                             .Take());
-            }
-            return Answer(list, result, message);
-        });
+        return Analyse(RunClockAnalysis, ClockRegionValue, result, message);
     }
 
     RESULT make_pin_compatible(const Str& s1, const Str& s2, const Str& s3, const Str& s4, Out& result,
@@ -645,6 +602,15 @@ private:
             return nullptr;
         }
         return &plan;
+    }
+
+    // Answers with what `run` finds in the open floorplan, an item a dict as `value` makes it.
+    template <class Run, class Value>
+    RESULT Analyse(Run run, Value value, Out& result, Msg& message) {
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
+            const auto items = run(*state.CurrentDesign(), plan);
+            return Answer(ListOf(items, [&](const auto& item) { return value(item, plan); }), result, message);
+        });
     }
 
     // A floorplan made from the current design, when none is open yet.

@@ -77,6 +77,33 @@ Tcl_Obj* ViewValue(const FloorplanData& plan, const Region& view) {
         .Take();
 }
 
+Tcl_Obj* FindingValue(const DrcFinding& f, const FloorplanData&) {
+    return DictBuilder().Add("rule", f.rule).Add("objects", NewList(f.objects)).Add("message", f.message).Take();
+}
+
+Tcl_Obj* SsoBankValue(const SsoBank& b, const FloorplanData&) {
+    const bool over = b.limit > 0 && static_cast<int>(b.outputs.size()) > b.limit;
+    return DictBuilder()
+        .Add("bank", b.bank)
+        .Add("outputs", b.outputs.size())
+        .Add("limit", b.limit)
+        .Add("status", over ? "over" : "ok")
+        .Add("ports", NewList(b.outputs))
+        .Take();
+}
+
+Tcl_Obj* ClockRegionValue(const ClockRegion& r, const FloorplanData& plan) {
+    const bool over = plan.clockLimit > 0 && static_cast<int>(r.nets.size()) > plan.clockLimit;
+    return DictBuilder()
+        .Add("block", r.block)
+        .Add("region", RegionText(r.region))
+        .Add("nets", NewList(r.nets))
+        .Add("count", r.nets.size())
+        .Add("limit", plan.clockLimit)
+        .Add("status", over ? "over" : "ok")
+        .Take();
+}
+
 Tcl_Obj* FloorplanProperty(const ToolState& state, const FloorplanData& plan, const std::string& key) {
     const Device& d = plan.device;
     if (key == "name") return NewText(plan.name);

@@ -22,6 +22,10 @@ Tcl_Obj* BlockProperty(const FloorplanData& plan, const Block& block, const std:
 Tcl_Obj* BlockValue(const FloorplanData& plan, const Block& block);
 // The view's corners and the blocks whose regions it shows.
 Tcl_Obj* ViewValue(const FloorplanData& plan, const Region& view);
+// One item of an analysis's answer, as a dict: a drc finding, an sso bank, a clock region.
+Tcl_Obj* FindingValue(const DrcFinding& finding, const FloorplanData& plan);
+Tcl_Obj* SsoBankValue(const SsoBank& bank, const FloorplanData& plan);
+Tcl_Obj* ClockRegionValue(const ClockRegion& region, const FloorplanData& plan);
 
 std::vector<std::string> BlockList(const FloorplanConstraints& constraints);
 // Sites in the order of the device: row by row.

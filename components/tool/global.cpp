@@ -12,15 +12,14 @@ Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors) {
         for (const auto& [name, setting] : table.All()) dict.Add(name, setting.value);
         return dict.Take();
     }
-    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-    for (const auto& [name, setting] : table.All()) {
+    return ListOf(table.All(), [](const auto& entry) {
+        const auto& [name, setting] = entry;
         DictBuilder d;
         d.Add("name", name).Add("type", SettingTypeWord(setting.type)).Add("description", setting.description);
         d.Add("value", setting.value);
         if (!setting.choices.empty()) d.Add("choices", NewList(setting.choices));
-        Tcl_ListObjAppendElement(nullptr, list, d.Take());
-    }
-    return list;
+        return d.Take();
+    });
 }
 
 namespace {

@@ -3,6 +3,7 @@
 
 #include <cmath>
 #include <cstdio>
+#include <functional>
 #include <string>
 #include <utility>
 
@@ -35,17 +36,9 @@ Tcl_Obj* NewDouble(double value) {
 
 Tcl_Obj* NewBool(bool value) { return Tcl_NewIntObj(value ? 1 : 0); }
 
-Tcl_Obj* NewList(const std::vector<std::string>& words) {
-    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-    for (const std::string& w : words) Tcl_ListObjAppendElement(nullptr, list, NewText(w));
-    return list;
-}
+Tcl_Obj* NewList(const std::vector<std::string>& words) { return ListOf(words, NewText); }
 
-Tcl_Obj* NewList(std::initializer_list<Tcl_Obj*> items) {
-    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-    for (Tcl_Obj* item : items) Tcl_ListObjAppendElement(nullptr, list, item);
-    return list;
-}
+Tcl_Obj* NewList(std::initializer_list<Tcl_Obj*> items) { return ListOf(items, std::identity{}); }
 
 DictBuilder::DictBuilder() : m_dict(Tcl_NewListObj(0, nullptr)) {}
 

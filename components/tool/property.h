@@ -49,6 +49,15 @@ Tcl_Obj* NewBool(bool value);      // 1 or 0
 Tcl_Obj* NewList(const std::vector<std::string>& words);
 Tcl_Obj* NewList(std::initializer_list<Tcl_Obj*> items);  // takes the items as they are
 
+// The list of what `value` makes of each of `items`, in their order: the one way a list of dicts
+// (findings, paths, descriptors) is built. `value` gives each element without references.
+template <class Items, class Value>
+Tcl_Obj* ListOf(const Items& items, Value value) {
+    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
+    for (const auto& item : items) Tcl_ListObjAppendElement(nullptr, list, value(item));
+    return list;
+}
+
 // A dict built in insertion order, so that answers read in a fixed, meaningful order.
 class DictBuilder {
 public:

@@ -129,19 +129,15 @@ Tcl_Obj* PathValue(const TimingPath& p, const std::vector<std::string>& fields) 
 }
 
 Tcl_Obj* PathsValue(const Analysis& a) {
-    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-    if (!a.result) return list;
+    if (!a.result) return Tcl_NewListObj(0, nullptr);
     const auto fields = Fields(a.settings);
-    for (const TimingPath& p : a.result->paths) Tcl_ListObjAppendElement(nullptr, list, PathValue(p, fields));
-    return list;
+    return ListOf(a.result->paths, [&](const TimingPath& p) { return PathValue(p, fields); });
 }
 
 Tcl_Obj* FanoutValue(const Analysis& a) {
-    Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-    if (!a.result) return list;
-    for (const FanoutNet& n : a.result->highFanout)
-        Tcl_ListObjAppendElement(nullptr, list, DictBuilder().Add("net", n.net).Add("fanout", n.fanout).Take());
-    return list;
+    if (!a.result) return Tcl_NewListObj(0, nullptr);
+    return ListOf(a.result->highFanout,
+                  [](const FanoutNet& n) { return DictBuilder().Add("net", n.net).Add("fanout", n.fanout).Take(); });
 }
 
 std::string Status(const ToolState& state, const Analysis& a) {
@@ -191,6 +187,15 @@ constexpr Descriptor kSettings[] = {
      [](State, An a) { return FiltersValue(a.settings); }},
 };
 
+Tcl_Obj* DescriptorValue(const Descriptor& d) {
+    return DictBuilder()
+        .Add("name", d.name)
+        .Add("type", d.type)
+        .Add("access", d.writable ? "read-write" : "read-only")
+        .Add("description", d.description)
+        .Take();
+}
+
 std::string Number(double value) { return TclValue(NewDouble(value)).Text(); }
 
 class TimingAnalysis final : public Component<TcltaskI::ITimingAnalysis> {
@@ -204,16 +209,7 @@ public:
                 for (const auto& [id, a] : Data(state).analyses) ids.push_back(id);
                 return Answer(NewList(ids), result, message);
             }
-            Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-            for (const Descriptor& d : kSettings)
-                Tcl_ListObjAppendElement(nullptr, list,
-                                         DictBuilder()
-                                             .Add("name", d.name)
-                                             .Add("type", d.type)
-                                             .Add("access", d.writable ? "read-write" : "read-only")
-                                             .Add("description", d.description)
-                                             .Take());
-            return Answer(list, result, message);
+            return Answer(ListOf(kSettings, DescriptorValue), result, message);
         });
     }
 
