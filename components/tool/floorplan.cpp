@@ -108,88 +108,84 @@ public:
     explicit Floorplan(const StatePtr& state) : m_state(state) {}
 
     RESULT open(Out& result, Msg& message) override {
-        StatePtr state;
-        FloorplanData fresh;
-        if (!Start(state, fresh, message)) return 0;
-        return Install(*state, std::move(fresh), result, message);
+        return Opening(result, message, [](ToolState&, FloorplanData&) -> RESULT { return 1; });
     }
 
     RESULT open_full(const Str& s1, const Str& s2, const Str& s3, Out& result, Msg& message) override {
-        StatePtr state;
-        FloorplanData fresh;
-        if (!Start(state, fresh, message)) return 0;
-        const std::string file = s1.c_str(), formWord = s2.c_str(), mode = s3.c_str();
-        const auto form = FormFromWord(formWord);
-        if (!form) return Fail(message, "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
-        if (mode != "replace" && mode != "merge")
-            return Fail(message, "unknown mode '" + mode + "': use replace or merge");
-        FloorplanConstraints read;
-        std::string error;
-        if (!Load(*form, file, read, error)) return Fail(message, error);
-        if (mode == "replace") {
-            fresh.constraints.blocks.clear();
-            fresh.constraints.prohibited.clear();
-        }
-        MergeConstraints(fresh.constraints, read);
-        error = CheckConstraints(*state->CurrentDesign(), fresh.device, fresh.constraints);
-        if (!error.empty()) return Fail(message, "'" + file + "': " + error);
-        fresh.modified = true;
-        return Install(*state, std::move(fresh), result, message);
+        return Opening(result, message, [&](ToolState& state, FloorplanData& fresh) -> RESULT {
+            const std::string file = s1.c_str(), formWord = s2.c_str(), mode = s3.c_str();
+            const auto form = FormFromWord(formWord);
+            if (!form) return Fail(message, "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
+            if (mode != "replace" && mode != "merge")
+                return Fail(message, "unknown mode '" + mode + "': use replace or merge");
+            FloorplanConstraints read;
+            std::string error;
+            if (!Load(*form, file, read, error)) return Fail(message, error);
+            if (mode == "replace") {
+                fresh.constraints.blocks.clear();
+                fresh.constraints.prohibited.clear();
+            }
+            MergeConstraints(fresh.constraints, read);
+            error = CheckConstraints(*state.CurrentDesign(), fresh.device, fresh.constraints);
+            if (!error.empty()) return Fail(message, "'" + file + "': " + error);
+            fresh.modified = true;
+            return 1;
+        });
     }
 
     RESULT open_empty(const Str& s1, const Str& s2, const Str& s3, const Str& s4, const Str& s5, const Str& s6,
                       const Str& s7, const Str& s8, const Str& s9, Out& result, Msg& message) override {
-        StatePtr state;
-        FloorplanData fresh;
-        if (!Start(state, fresh, message)) return 0;
-        const std::string name = s1.c_str(), device = s2.c_str(), layout = s6.c_str();
-        int columns = 0, rows = 0, banks = 0, sso = 0, capacity = 0, clocks = 0;
-        if (name.empty()) return Fail(message, "the floorplan needs a name");
-        if (device.empty()) return Fail(message, "the device needs a name");
-        if (!WholeNumber(s3.c_str(), 1, 100000, columns))
-            return Fail(message, "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
-        if (!WholeNumber(s4.c_str(), 1, 100000, rows))
-            return Fail(message, "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
-        if (layout != "columns" && layout != "rows")
-            return Fail(message, "unknown bank layout '" + layout + "': use columns or rows");
-        const int stripes = layout == "columns" ? columns : rows;
-        if (!WholeNumber(s5.c_str(), 1, stripes, banks))
-            return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(stripes) + ", not '" +
-                                     std::string(s5.c_str()) + "'");
-        if (!WholeNumber(s7.c_str(), 0, 1000000, sso))
-            return Fail(message,
-                        "the sso limit must be a whole number of at least 0, not '" + std::string(s7.c_str()) + "'");
-        if (!WholeNumber(s8.c_str(), 1, 1000000, capacity))
-            return Fail(message,
-                        "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
-        if (!WholeNumber(s9.c_str(), 0, 1000000, clocks))
-            return Fail(message,
-                        "the clock limit must be a whole number of at least 0, not '" + std::string(s9.c_str()) + "'");
-        Device d;
-        d.name = device;
-        d.columns = columns;
-        d.rows = rows;
-        d.siteCapacity = capacity;
-        for (int i = 0; i < banks; ++i) {
-            Bank b;
-            b.name = "BANK" + std::to_string(i);
-            const int first = static_cast<int>(static_cast<long long>(i) * stripes / banks);
-            const int last = static_cast<int>(static_cast<long long>(i + 1) * stripes / banks) - 1;
-            if (layout == "columns")
-                b.x0 = first, b.x1 = last, b.y0 = 0, b.y1 = rows - 1;
-            else
-                b.x0 = 0, b.x1 = columns - 1, b.y0 = first, b.y1 = last;
-            b.ssoLimit = sso;
-            d.banks.push_back(std::move(b));
-        }
-        fresh.name = name;
-        fresh.device = std::move(d);
-        fresh.constraints.blocks.clear();
-        fresh.constraints.prohibited.clear();
-        fresh.clockLimit = clocks;
-        fresh.view = WholeDevice(fresh.device);
-        fresh.modified = true;
-        return Install(*state, std::move(fresh), result, message);
+        return Opening(result, message, [&](ToolState&, FloorplanData& fresh) -> RESULT {
+            const std::string name = s1.c_str(), device = s2.c_str(), layout = s6.c_str();
+            int columns = 0, rows = 0, banks = 0, sso = 0, capacity = 0, clocks = 0;
+            if (name.empty()) return Fail(message, "the floorplan needs a name");
+            if (device.empty()) return Fail(message, "the device needs a name");
+            if (!WholeNumber(s3.c_str(), 1, 100000, columns))
+                return Fail(message,
+                            "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
+            if (!WholeNumber(s4.c_str(), 1, 100000, rows))
+                return Fail(message, "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
+            if (layout != "columns" && layout != "rows")
+                return Fail(message, "unknown bank layout '" + layout + "': use columns or rows");
+            const int stripes = layout == "columns" ? columns : rows;
+            if (!WholeNumber(s5.c_str(), 1, stripes, banks))
+                return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(stripes) +
+                                         ", not '" + std::string(s5.c_str()) + "'");
+            if (!WholeNumber(s7.c_str(), 0, 1000000, sso))
+                return Fail(message, "the sso limit must be a whole number of at least 0, not '" +
+                                         std::string(s7.c_str()) + "'");
+            if (!WholeNumber(s8.c_str(), 1, 1000000, capacity))
+                return Fail(message,
+                            "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
+            if (!WholeNumber(s9.c_str(), 0, 1000000, clocks))
+                return Fail(message, "the clock limit must be a whole number of at least 0, not '" +
+                                         std::string(s9.c_str()) + "'");
+            Device d;
+            d.name = device;
+            d.columns = columns;
+            d.rows = rows;
+            d.siteCapacity = capacity;
+            for (int i = 0; i < banks; ++i) {
+                Bank b;
+                b.name = "BANK" + std::to_string(i);
+                const int first = static_cast<int>(static_cast<long long>(i) * stripes / banks);
+                const int last = static_cast<int>(static_cast<long long>(i + 1) * stripes / banks) - 1;
+                if (layout == "columns")
+                    b.x0 = first, b.x1 = last, b.y0 = 0, b.y1 = rows - 1;
+                else
+                    b.x0 = 0, b.x1 = columns - 1, b.y0 = first, b.y1 = last;
+                b.ssoLimit = sso;
+                d.banks.push_back(std::move(b));
+            }
+            fresh.name = name;
+            fresh.device = std::move(d);
+            fresh.constraints.blocks.clear();
+            fresh.constraints.prohibited.clear();
+            fresh.clockLimit = clocks;
+            fresh.view = WholeDevice(fresh.device);
+            fresh.modified = true;
+            return 1;
+        });
     }
 
     RESULT close(bool nosave, Out& result, Msg& message) override {
@@ -311,9 +307,7 @@ public:
 
     RESULT properties(Out& result, Msg& message) override {
         return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
-            DictBuilder d;
-            for (const std::string& key : kFloorplanProperties) d.Add(key, FloorplanProperty(state, plan, key));
-            return Answer(d.Take(), result, message);
+            return Answer(FloorplanValue(state, plan), result, message);
         });
     }
 
@@ -613,15 +607,24 @@ private:
         });
     }
 
+    // Opens a floorplan made from the current design, once `prepare` has made it what the operation
+    // opens; on any failure none is open.
+    template <class Prepare>
+    RESULT Opening(Out& result, Msg& message, Prepare prepare) {
+        return OnState(message, [&](ToolState& state) -> RESULT {
+            FloorplanData fresh;
+            if (!Start(state, fresh, message) || !prepare(state, fresh)) return 0;
+            return Install(state, std::move(fresh), result, message);
+        });
+    }
+
     // A floorplan made from the current design, when none is open yet.
-    bool Start(StatePtr& state, FloorplanData& fresh, Msg& message) {
-        state = m_state.lock();
-        if (!state) return Gone(message) != 0;
-        if (Plan(*state).open) return Fail(message, "the floorplan is open already: close it first") != 0;
-        const Design* design = state->CurrentDesign();
+    static bool Start(ToolState& state, FloorplanData& fresh, Msg& message) {
+        if (Plan(state).open) return Fail(message, "the floorplan is open already: close it first") != 0;
+        const Design* design = state.CurrentDesign();
         if (!design) return Fail(message, kNoProject) != 0;
         fresh.open = true;
-        fresh.epoch = state->designEpoch;
+        fresh.epoch = state.designEpoch;
         auto name = design->properties.find(kNameKey);
         fresh.name = name != design->properties.end() ? name->second : design->name;
         fresh.device = design->device;
@@ -635,10 +638,8 @@ private:
         return true;
     }
 
-    RESULT Install(ToolState& state, FloorplanData fresh, Out& result, Msg& message) {
-        DictBuilder d;
-        for (const std::string& key : kFloorplanProperties) d.Add(key, FloorplanProperty(state, fresh, key));
-        if (!Answer(d.Take(), result, message)) return 0;
+    static RESULT Install(ToolState& state, FloorplanData fresh, Out& result, Msg& message) {
+        if (!Answer(FloorplanValue(state, fresh), result, message)) return 0;
         Plan(state) = std::move(fresh);
         return 1;
     }

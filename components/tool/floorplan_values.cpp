@@ -132,4 +132,10 @@ Tcl_Obj* FloorplanProperty(const ToolState& state, const FloorplanData& plan, co
     return ViewValue(plan, plan.view);
 }
 
+Tcl_Obj* FloorplanValue(const ToolState& state, const FloorplanData& plan) {
+    DictBuilder d;
+    for (const std::string& key : kFloorplanProperties) d.Add(key, FloorplanProperty(state, plan, key));
+    return d.Take();
+}
+
 }  // namespace kelmartool

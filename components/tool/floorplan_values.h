@@ -17,6 +17,8 @@ extern const std::vector<std::string> kBlockProperties;
 
 // Each gives a new value without references.
 Tcl_Obj* FloorplanProperty(const ToolState& state, const FloorplanData& plan, const std::string& key);
+// Every setting of a floorplan, as a dict in the order of kFloorplanProperties.
+Tcl_Obj* FloorplanValue(const ToolState& state, const FloorplanData& plan);
 Tcl_Obj* BlockProperty(const FloorplanData& plan, const Block& block, const std::string& key);
 // Every property of a block but its name, as a dict.
 Tcl_Obj* BlockValue(const FloorplanData& plan, const Block& block);
