@@ -32,14 +32,12 @@
 #include "floorplan_values.h"
 #include "project.h"
 #include "property.h"
+#include "weak_state.h"
 
 namespace kelmartool {
 
 namespace {
 
-using Str = Port_String;
-using Out = UtilI::MITclProperty;
-using Msg = Port_String;
 using CommonI::RESULT;
 
 constexpr const char* kNotOpen = "no floorplan is open: open one with floorplan open";
@@ -48,12 +46,6 @@ constexpr const char* kClockLimitKey = "clock_limit";
 
 const std::vector<std::string> kWritable{"name", "site_capacity", "sso_limit", "clock_limit"};
 std::string Quote(const std::string& name) { return "'" + name + "'"; }
-
-std::string Join(const std::vector<std::string>& words, const char* separator = ", ") {
-    std::string out;
-    for (const std::string& w : words) out += (out.empty() ? "" : separator) + w;
-    return out;
-}
 
 bool WholeNumber(const std::string& text, long long low, long long high, int& out) {
     if (text.empty()) return false;
@@ -189,7 +181,7 @@ public:
     }
 
     RESULT close(bool nosave, Out& result, Msg& message) override {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             FloorplanData& plan = Plan(state);
             if (!plan.open) return Fail(message, kNotOpen);
             std::string file;
@@ -201,7 +193,7 @@ public:
     }
 
     RESULT save(Out& result, Msg& message) override {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             std::string file;
             if (!Commit(state, file, message)) return 0;
             return Answer(NewText(file), result, message);
@@ -312,7 +304,7 @@ public:
     }
 
     RESULT get(const Str& name, Out& result, Msg& message) override {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             const std::string key = name.c_str();
             if (key == "open") return Answer(NewBool(Plan(state).open), result, message);
             if (std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) == kFloorplanProperties.end())
@@ -324,7 +316,7 @@ public:
     }
 
     RESULT set(const Str& name, const Str& value, Out& result, Msg& message) override {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             const std::string key = name.c_str(), text = value.c_str();
             if (std::find(kWritable.begin(), kWritable.end(), key) == kWritable.end()) {
                 if (key == "open" || std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) !=
@@ -556,20 +548,10 @@ public:
     }
 
 private:
-    static RESULT Gone(Msg& message) { return Fail(message, "the tool state of this interpreter is gone"); }
-
-    // Runs `op` on the tool state, while the interpreter still has one.
-    template <class Op>
-    RESULT OnState(Msg& message, Op op) {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        return op(*state);
-    }
-
     // Runs `op` on the open floorplan, when it belongs to the current design (Ready).
     template <class Op>
     RESULT OnPlan(Msg& message, Op op) {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             FloorplanData* plan = Ready(state, message);
             return plan ? op(state, *plan) : 0;
         });
@@ -611,7 +593,7 @@ private:
     // opens; on any failure none is open.
     template <class Prepare>
     RESULT Opening(Out& result, Msg& message, Prepare prepare) {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             FloorplanData fresh;
             if (!Start(state, fresh, message) || !prepare(state, fresh)) return 0;
             return Install(state, std::move(fresh), result, message);
@@ -782,7 +764,7 @@ private:
         });
     }
 
-    std::weak_ptr<ToolState> m_state;  // the interpreter owns the state; this object may outlive it
+    WeakState m_state;
 };
 
 }  // namespace

@@ -86,6 +86,12 @@ CommonI::RESULT Fail(Port_String& message, const std::string& text) {
     return 0;
 }
 
+std::string Join(const std::vector<std::string>& words, const char* separator) {
+    std::string out;
+    for (const std::string& w : words) out += (out.empty() ? "" : separator) + w;
+    return out;
+}
+
 TclValue ValueOf(const UtilI::MITclProperty& property) {
     if (!property) return {};
     Tcl_Obj* out = nullptr;

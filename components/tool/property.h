@@ -89,6 +89,8 @@ UtilI::MITclProperty MakeProperty(Tcl_Obj* value, Port_String& message);
 CommonI::RESULT Answer(Tcl_Obj* value, UtilI::MITclProperty& result, Port_String& message);
 // Gives 0 with `text` as the failure text.
 CommonI::RESULT Fail(Port_String& message, const std::string& text);
+// The words one after the other, for a failure text that lists the choices.
+std::string Join(const std::vector<std::string>& words, const char* separator = ", ");
 
 // The Tcl value a property holds (counted), or an empty value for a null property.
 TclValue ValueOf(const UtilI::MITclProperty& property);

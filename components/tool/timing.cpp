@@ -29,15 +29,13 @@
 #include "TcltaskI/ITimingAnalysis.h"
 #include "component.h"
 #include "property.h"
+#include "weak_state.h"
 #include "timing_model.h"
 
 namespace kelmartool {
 
 namespace {
 
-using Str = Port_String;
-using Out = UtilI::MITclProperty;
-using Msg = Port_String;
 using CommonI::RESULT;
 
 // The fields of a reported path, in the order a path's dict has them.
@@ -65,12 +63,6 @@ bool IsNumber(const std::string& text, double& value) {
     char* end = nullptr;
     value = std::strtod(text.c_str(), &end);
     return end == text.c_str() + text.size() && std::isfinite(value);
-}
-
-std::string Join(const std::vector<std::string>& words, const char* separator = ", ") {
-    std::string out;
-    for (const std::string& w : words) out += (out.empty() ? "" : separator) + w;
-    return out;
 }
 
 Tcl_Obj* ConstraintsValue(const TimingSettings& s) {
@@ -203,7 +195,7 @@ public:
     explicit TimingAnalysis(const StatePtr& state) : m_state(state) {}
 
     RESULT properties(bool descriptors, Out& result, Msg& message) override {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             if (!descriptors) {
                 std::vector<std::string> ids;
                 for (const auto& [id, a] : Data(state).analyses) ids.push_back(id);
@@ -214,7 +206,7 @@ public:
     }
 
     RESULT delete_(const Str& analysis, Out& result, Msg& message) override {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             TimingData& data = Data(state);
             if (!Find(data, analysis, message)) return 0;
             std::vector<std::string> left;
@@ -252,7 +244,7 @@ public:
     }
 
     RESULT new_(const Str& analysis, const Str& name, Out& result, Msg& message) override {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             const std::string id = analysis.c_str();
             if (id.empty() || id.find_first_of(" \t\n") != std::string::npos)
                 return Fail(message, "the name of a timing analysis must be one word, not '" + id + "'");
@@ -427,20 +419,10 @@ public:
     }
 
 private:
-    static RESULT Gone(Msg& message) { return Fail(message, "the tool state of this interpreter is gone"); }
-
-    // Runs `op` on the tool state, while the interpreter still has one.
-    template <class Op>
-    RESULT OnState(Msg& message, Op op) {
-        auto state = m_state.lock();
-        if (!state) return Gone(message);
-        return op(*state);
-    }
-
     // Runs `op` on the named analysis, when there is one (Find).
     template <class Op>
     RESULT OnAnalysis(const Str& analysis, Msg& message, Op op) {
-        return OnState(message, [&](ToolState& state) -> RESULT {
+        return m_state.On(message, [&](ToolState& state) -> RESULT {
             Analysis* a = Find(Data(state), analysis, message);
             return a ? op(state, *a) : 0;
         });
@@ -608,7 +590,7 @@ private:
         });
     }
 
-    std::weak_ptr<ToolState> m_state;  // the interpreter owns the state; this object may outlive it
+    WeakState m_state;
 };
 
 }  // namespace
