@@ -22,6 +22,19 @@ Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors) {
     });
 }
 
+CommonI::RESULT SetSetting(SettingTable& table, const std::string& name, const std::string& text, bool allowNew,
+                           UtilI::MITclProperty& result, Port_String& message) {
+    if (std::string error = table.Set(name, text, allowNew); !error.empty()) return Fail(message, error);
+    return Answer(NewText(table.Find(name)->value), result, message);
+}
+
+CommonI::RESULT GetSetting(const SettingTable& table, const std::string& name, const char* what,
+                           UtilI::MITclProperty& result, Port_String& message) {
+    const Setting* setting = table.Find(name);
+    if (setting == nullptr) return Fail(message, std::string("unknown ") + what + " '" + name + "'");
+    return Answer(NewText(setting->value), result, message);
+}
+
 namespace {
 
 class Global final : public Component<TcltaskI::IGlobal> {
@@ -29,9 +42,7 @@ public:
     explicit Global(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
-        if (std::string error = m_state->settings.Set(name.c_str(), TextOf(value), true); !error.empty())
-            return Fail(message, error);
-        return Answer(NewText(m_state->settings.Find(name.c_str())->value), result, message);
+        return SetSetting(m_state->settings, name.c_str(), TextOf(value), true, result, message);
     }
 
     CommonI::RESULT unset(const Str& name, Out& result, Msg& message) override {
@@ -42,9 +53,7 @@ public:
     }
 
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
-        const Setting* setting = m_state->settings.Find(name.c_str());
-        if (setting == nullptr) return Fail(message, std::string("unknown setting '") + name.c_str() + "'");
-        return Answer(NewText(setting->value), result, message);
+        return GetSetting(m_state->settings, name.c_str(), "setting", result, message);
     }
 
     CommonI::RESULT properties(Out& result, Msg& message) override {

@@ -39,16 +39,12 @@ public:
     }
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
-        if (std::string error = m_state->highlightSettings.Set(name.c_str(), TextOf(value), false); !error.empty())
-            return Fail(message, error);
-        return Answer(NewText(m_state->highlightSettings.Find(name.c_str())->value), result, message);
+        return SetSetting(m_state->highlightSettings, name.c_str(), TextOf(value), false, result, message);
     }
 
     // Answers without an open project: the default of `highlight add -color` asks on every call.
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
-        const Setting* s = m_state->highlightSettings.Find(name.c_str());
-        if (s == nullptr) return Fail(message, std::string("unknown highlight setting '") + name.c_str() + "'");
-        return Answer(NewText(s->value), result, message);
+        return GetSetting(m_state->highlightSettings, name.c_str(), "highlight setting", result, message);
     }
 
     CommonI::RESULT properties(bool descriptors, Out& result, Msg& message) override {

@@ -3,6 +3,7 @@
 #pragma once
 
 #include "design.h"
+#include "property.h"
 
 namespace kelmartool {
 
@@ -17,5 +18,11 @@ CitI::IInterface* NewSearch(const StatePtr& state);
 // Settings tables answer alike wherever they are kept: a dict of name and value, or with
 // descriptors a list of dicts with name, type, description and value.
 Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors);
+// Sets one setting of a table (a new one too, when `allowNew`) and answers with its canonical value.
+CommonI::RESULT SetSetting(SettingTable& table, const std::string& name, const std::string& text, bool allowNew,
+                           UtilI::MITclProperty& result, Port_String& message);
+// Answers with the value of one setting; `what` names the setting's kind in the failure text.
+CommonI::RESULT GetSetting(const SettingTable& table, const std::string& name, const char* what,
+                           UtilI::MITclProperty& result, Port_String& message);
 
 }  // namespace kelmartool

@@ -40,15 +40,11 @@ public:
     }
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
-        if (std::string error = m_state->selectionSettings.Set(name.c_str(), TextOf(value), false); !error.empty())
-            return Fail(message, error);
-        return Answer(NewText(m_state->selectionSettings.Find(name.c_str())->value), result, message);
+        return SetSetting(m_state->selectionSettings, name.c_str(), TextOf(value), false, result, message);
     }
 
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
-        const Setting* s = m_state->selectionSettings.Find(name.c_str());
-        if (s == nullptr) return Fail(message, std::string("unknown selection setting '") + name.c_str() + "'");
-        return Answer(NewText(s->value), result, message);
+        return GetSetting(m_state->selectionSettings, name.c_str(), "selection setting", result, message);
     }
 
     CommonI::RESULT properties(bool descriptors, Out& result, Msg& message) override {
