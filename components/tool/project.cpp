@@ -7,6 +7,7 @@
 #include <filesystem>
 
 #include "TcltaskI/ITclProjectMgr.h"
+#include "property.h"
 
 namespace kelmartool {
 
@@ -39,16 +40,10 @@ bool ProjectComponent::IsCurrent() const {
 
 CommonI::RESULT ProjectComponent::OpenWithHelper(const Port_String& file, Dpm::IProjectHelper* helper,
                                                  Port_String& message) {
-    if (file.IsEmpty()) {
-        message = "no project file given";
-        return 0;
-    }
+    if (file.IsEmpty()) return Fail(message, "no project file given");
     std::string error;
     auto design = ReadDesign(file.c_str(), error);
-    if (!design) {
-        message = error.c_str();
-        return 0;
-    }
+    if (!design) return Fail(message, error);
     m_file = NormalFile(file.c_str());
     m_helperName = helper != nullptr ? helper->GetName().c_str() : "";
     m_design = std::move(design);
@@ -87,30 +82,18 @@ CommonI::RESULT ProjectComponent::Close() {
 }
 
 CommonI::RESULT ProjectComponent::Sync(Port_String& message) {
-    if (!IsOpen()) {
-        message = kNoProject;
-        return 0;
-    }
+    if (!IsOpen()) return Fail(message, kNoProject);
     std::string error;
-    if (!WriteDesign(*m_design, m_file, error)) {
-        message = error.c_str();
-        return 0;
-    }
+    if (!WriteDesign(*m_design, m_file, error)) return Fail(message, error);
     message = ("wrote " + m_file).c_str();
     return 1;
 }
 
 CommonI::RESULT ProjectComponent::Reload(Port_String& message) {
-    if (!IsOpen()) {
-        message = kNoProject;
-        return 0;
-    }
+    if (!IsOpen()) return Fail(message, kNoProject);
     std::string error;
     auto design = ReadDesign(m_file, error);
-    if (!design) {
-        message = error.c_str();  // the design in memory stays as it was
-        return 0;
-    }
+    if (!design) return Fail(message, error);  // the design in memory stays as it was
     m_design = std::move(design);
     message = ("reloaded " + Summary(*m_design)).c_str();
     if (IsCurrent())
@@ -176,16 +159,12 @@ public:
                 return 1;
             }
         }
-        message = ("no open project has the file '" + std::string(file.c_str()) + "'").c_str();
-        return 0;
+        return Fail(message, "no open project has the file '" + std::string(file.c_str()) + "'");
     }
 
     CommonI::RESULT CloseCurrent(Port_String& message) override {
         ProjectComponent* current = CurrentOf(m_state);
-        if (current == nullptr) {
-            message = kNoProject;
-            return 0;
-        }
+        if (current == nullptr) return Fail(message, kNoProject);
         message = ("closed " + current->File()).c_str();
         current->Drop();
         return 1;
@@ -224,10 +203,7 @@ public:
 
 private:
     static CommonI::RESULT Report(ProjectComponent* current, Port_String& message) {
-        if (current == nullptr) {
-            message = kNoProject;
-            return 0;
-        }
+        if (current == nullptr) return Fail(message, kNoProject);
         message = current->File().c_str();
         return 1;
     }
@@ -263,15 +239,11 @@ public:
     }
     CommonI::RESULT Sync(Port_String& message) override {
         ProjectComponent* current = CurrentOf(m_state);
-        if (current) return current->Sync(message);
-        message = kNoProject;
-        return 0;
+        return current ? current->Sync(message) : Fail(message, kNoProject);
     }
     CommonI::RESULT Reload(Port_String& message) override {
         ProjectComponent* current = CurrentOf(m_state);
-        if (current) return current->Reload(message);
-        message = kNoProject;
-        return 0;
+        return current ? current->Reload(message) : Fail(message, kNoProject);
     }
     CommonI::RESULT RegisterComponent(const Port::XUID& id, CitI::MIInterface& component) override {
         ProjectComponent* current = CurrentOf(m_state);
