@@ -11,13 +11,6 @@
 
 namespace kelmartool {
 
-std::string TclValue::Text() const {
-    if (m_obj == nullptr) return {};
-    int length = 0;
-    const char* text = Tcl_GetStringFromObj(m_obj, &length);
-    return std::string(text, static_cast<std::size_t>(length));
-}
-
 Tcl_Obj* NewText(std::string_view text) { return Tcl_NewStringObj(text.data(), static_cast<int>(text.size())); }
 
 Tcl_Obj* NewInt(long long value) { return Tcl_NewWideIntObj(static_cast<Tcl_WideInt>(value)); }

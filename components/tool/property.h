@@ -12,34 +12,13 @@
 #include <vector>
 
 #include "Port/StringBase.h"
+#include "Script/TclObjRef.h"
 #include "UtilI/ITclProperty.h"
 
 namespace kelmartool {
 
 // A counted Tcl value: holds one reference of its own for as long as it lives.
-class TclValue {
-public:
-    TclValue() noexcept = default;
-    explicit TclValue(Tcl_Obj* obj) noexcept : m_obj(obj) {
-        if (m_obj != nullptr) Tcl_IncrRefCount(m_obj);
-    }
-    TclValue(const TclValue& other) noexcept : TclValue(other.m_obj) {}
-    TclValue(TclValue&& other) noexcept : m_obj(std::exchange(other.m_obj, nullptr)) {}
-    TclValue& operator=(TclValue other) noexcept {
-        std::swap(m_obj, other.m_obj);
-        return *this;
-    }
-    ~TclValue() {
-        if (m_obj != nullptr) Tcl_DecrRefCount(m_obj);
-    }
-
-    Tcl_Obj* get() const noexcept { return m_obj; }
-    explicit operator bool() const noexcept { return m_obj != nullptr; }
-    std::string Text() const;
-
-private:
-    Tcl_Obj* m_obj = nullptr;
-};
+using TclValue = Script::TclObjRef;
 
 // Builders of plain values. Every one gives a new object without references.
 Tcl_Obj* NewText(std::string_view text);

@@ -5,31 +5,12 @@
 
 #include <utility>
 
+#include "Script/TclObjRef.h"
+
 namespace TestKit {
 
 // One reference on a Tcl value.
-class TclRef {
-public:
-    TclRef() noexcept = default;
-    explicit TclRef(Tcl_Obj* obj) noexcept : m_obj(obj) {
-        if (m_obj) Tcl_IncrRefCount(m_obj);
-    }
-    TclRef(const TclRef& other) noexcept : TclRef(other.m_obj) {}
-    TclRef(TclRef&& other) noexcept : m_obj(std::exchange(other.m_obj, nullptr)) {}
-    TclRef& operator=(TclRef other) noexcept {
-        std::swap(m_obj, other.m_obj);
-        return *this;
-    }
-    ~TclRef() {
-        if (m_obj) Tcl_DecrRefCount(m_obj);
-    }
-
-    Tcl_Obj* get() const noexcept { return m_obj; }
-    explicit operator bool() const noexcept { return m_obj != nullptr; }
-
-private:
-    Tcl_Obj* m_obj = nullptr;
-};
+using TclRef = Script::TclObjRef;
 
 // The interpreter's result, return options and error state, put back when the guard goes.
 class SavedInterpState {
