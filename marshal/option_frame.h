@@ -8,36 +8,16 @@
 
 #include <array>
 #include <utility>
+#include <variant>
 
 #include "Script/TclWrapSupport.h"
 #include "marshal/declare.h"
-#include "marshal/fetch_store.h"
+#include "marshal/fetch_value.h"
 #include "marshal/options.h"
 #include "marshal/property.h"
 #include "package/report.h"
 
 namespace TcltaskI {
-
-// The Fetch of one value by its storage type.
-inline int FetchValue(Port_String& value, Tcl_Interp* interp, Script::Handle* word, int direction) {
-    return Script::TclWrapSupport::FetchString(value, interp, word, direction);
-}
-inline int FetchValue(bool& value, Tcl_Interp* interp, Script::Handle* word, int direction) {
-    return Script::TclWrapSupport::FetchBool(value, interp, word, direction);
-}
-inline int FetchValue(int32_t& value, Tcl_Interp* interp, Script::Handle* word, int direction) {
-    return Script::TclWrapSupport::FetchInt32(value, interp, word, direction);
-}
-inline int FetchValue(UtilI::MITclProperty& value, Tcl_Interp* interp, Script::Handle* word, int direction) {
-    return Fetch_InterfaceType<UtilI::ITclProperty>(value, interp, word, direction);
-}
-// A list element: fetched like a property and appended.
-inline int FetchValue(UtilI::TclPropertyList& list, Tcl_Interp* interp, Script::Handle* word, int direction) {
-    UtilI::MITclProperty element;
-    if (FetchValue(element, interp, word, direction) != 0) return 1;
-    list.push_back(std::move(element));
-    return 0;
-}
 
 // Gives back what a storage holds: properties drop their reference, lists their elements last first.
 inline void ReleaseValue(UtilI::MITclProperty& value) { value.Release(); }
@@ -97,7 +77,7 @@ struct OptionFrame {
         I* object = nullptr;
         if (self.Object(&object) != 0) return ErrorReport(interp, MethodText(kNoObjectText, W::kClassName, D.word));
 
-        MatchSession session;
+        [[maybe_unused]] std::conditional_t<kMatched, MatchSession, std::monostate> session;
         Script::Handle* const* words = argv;
         if constexpr (kMatched) {
             if (session.SetUp(interp, D.options.data(), N) != 0) return 1;

@@ -16,6 +16,7 @@
 #include "Script/TclWrapSupport.h"
 #include "marshal/declare.h"
 #include "marshal/fetch_store.h"
+#include "marshal/fetch_value.h"
 #include "package/report.h"
 
 namespace TcltaskI {
@@ -38,10 +39,9 @@ constexpr bool kIsIn = std::is_const_v<std::remove_reference_t<P>> || std::is_po
 template <class P>
 int Fetch(Local<P>& value, Tcl_Interp* interp, Script::Handle* word) {
     using T = Local<P>;
-    if constexpr (std::is_same_v<T, Port_String>) return Script::TclWrapSupport::FetchString(value, interp, word, Script::IN);
-    else if constexpr (std::is_same_v<T, Port::XUID>) return Script::TclWrapSupport::FetchGuid(value, interp, word, Script::IN);
-    else if constexpr (std::is_pointer_v<T>) return Fetch_Type(value, interp, word, Script::IN);
-    else return Fetch_InterfaceType(value, interp, word, Script::INOUT);
+    if constexpr (std::is_pointer_v<T>) return Fetch_Type(value, interp, word, Script::IN);
+    else if constexpr (std::is_same_v<T, CitI::MIInterface>) return Fetch_InterfaceType(value, interp, word, Script::INOUT);
+    else return FetchValue(value, interp, word, Script::IN);
 }
 
 template <class P>
