@@ -1,15 +1,20 @@
 // CitP::Factory and its init object. The class table and the library cache live in static storage
 // that needs no dynamic initialisation: a component library may register its classes from its own
-// static initialisers, before or after this library's. FactoryInit builds them in place on the
-// first module and takes them down on the last; a call before any init object builds them on first
-// use.
+// static initialisers, before or after this library's. FactoryInit counts the modules that hold the
+// factory up and takes the tables down with the last one.
+//
+// Threads: every interpreter thread asks the factory on every matched call, so lookups take no lock.
+// Both tables are lists that only grow while the factory is up; a new entry is published with one
+// atomic store, and an entry's creator is an atomic pointer, so that a reader sees either the old or
+// the new creator. Writers take a lock among themselves; nobody holds it while a library is opened,
+// since the library's own initialisers register their classes.
 #include "CitP/Factory.h"
 
 #include <dlfcn.h>
 
+#include <atomic>
 #include <cstring>
-#include <new>
-#include <vector>
+#include <mutex>
 
 #include "Port/Init.h"
 
@@ -20,54 +25,67 @@ namespace {
 struct ClassEntry {
     uint64_t first;
     uint64_t second;
-    ComponentCreator creator;
+    std::atomic<ComponentCreator> creator;
+    ClassEntry* next;
 };
 
 struct LibraryEntry {
     Port::StringBase<char> name;
     void* handle;  // never closed: registered creators point into the library
+    LibraryEntry* next;
 };
 
-struct FactoryState {
-    std::vector<ClassEntry> classes;
-    std::vector<LibraryEntry> libraries;
-};
+std::atomic<ClassEntry*> g_classes{nullptr};
+std::atomic<LibraryEntry*> g_libraries{nullptr};
+std::atomic<int> g_inits{0};
+std::atomic<int> g_libraryOpens{0};
+std::atomic<Factory::LoadFilter> g_loadFilter{nullptr};
+std::atomic<Factory::CreateFilter> g_createFilter{nullptr};
 
-alignas(FactoryState) unsigned char g_storage[sizeof(FactoryState)];
-FactoryState* g_state = nullptr;
-int g_inits = 0;
-int g_libraryOpens = 0;
-Factory::LoadFilter g_loadFilter = nullptr;
-Factory::CreateFilter g_createFilter = nullptr;
+// Never destroyed: a library may register or be asked for while the process winds down.
+std::mutex& WriterLock() {
+    static std::mutex* const lock = new std::mutex;
+    return *lock;
+}
 
-FactoryState& StateUp() noexcept {
-    if (!g_state) g_state = new (g_storage) FactoryState();
-    return *g_state;
+template <class Entry>
+void FreeList(std::atomic<Entry*>& head) noexcept {
+    Entry* entry = head.exchange(nullptr, std::memory_order_acq_rel);
+    while (entry) {
+        Entry* next = entry->next;
+        delete entry;
+        entry = next;
+    }
 }
 
 void TearDown() noexcept {
-    if (!g_state) return;
-    g_state->~FactoryState();
-    g_state = nullptr;
+    FreeList(g_classes);
+    FreeList(g_libraries);
 }
 
-ClassEntry* FindClass(FactoryState& state, const Port::XUID& classId) noexcept {
-    for (ClassEntry& entry : state.classes) {
-        if (entry.first == classId.First() && entry.second == classId.Second()) return &entry;
+ClassEntry* FindClass(const Port::XUID& classId) noexcept {
+    for (ClassEntry* entry = g_classes.load(std::memory_order_acquire); entry; entry = entry->next) {
+        if (entry->first == classId.First() && entry->second == classId.Second()) return entry;
     }
     return nullptr;
 }
 
 // A matched method asks for its libraries on every call: the answer for a known name must cost a
 // few comparisons and no allocation.
-bool IsCached(const FactoryState& state, const Port::StringBase<char>& name) noexcept {
+bool IsCached(const Port::StringBase<char>& name) noexcept {
     const int32_t length = name.Length();
-    for (const LibraryEntry& entry : state.libraries) {
-        if (entry.name.Length() == length &&
-            std::memcmp(entry.name.c_str(), name.c_str(), static_cast<size_t>(length)) == 0)
+    for (LibraryEntry* entry = g_libraries.load(std::memory_order_acquire); entry; entry = entry->next) {
+        if (entry->name.Length() == length &&
+            std::memcmp(entry->name.c_str(), name.c_str(), static_cast<size_t>(length)) == 0)
             return true;
     }
     return false;
+}
+
+template <class Entry>
+void Publish(std::atomic<Entry*>& head, Entry* entry) noexcept {
+    entry->next = head.load(std::memory_order_relaxed);
+    head.store(entry, std::memory_order_release);
 }
 
 // An address inside this library, for dladdr; internal, so it cannot be bound elsewhere.
@@ -94,8 +112,8 @@ Port::StringBase<char> LibraryPath(const Port::StringBase<char>& name) {
 }  // namespace
 
 bool Factory::LoadLibraryFactory(const Port::StringBase<char>& name) {
-    if (g_loadFilter && !g_loadFilter(name.c_str())) return false;
-    if (IsCached(StateUp(), name)) return true;
+    if (LoadFilter filter = g_loadFilter.load(std::memory_order_acquire); filter && !filter(name.c_str())) return false;
+    if (IsCached(name)) return true;
     // A name with a nul inside would open another file than the one the cache keeps it for.
     if (name.IsEmpty() || std::strlen(name.c_str()) != static_cast<size_t>(name.Length())) return false;
 
@@ -111,44 +129,49 @@ bool Factory::LoadLibraryFactory(const Port::StringBase<char>& name) {
     // Should registration throw, the library stays open and uncached: some of its creators may
     // already be in the table.
     reinterpret_cast<RegisterFunction>(symbol)();
-    StateUp().libraries.push_back(LibraryEntry{name, handle});
+    const std::lock_guard hold(WriterLock());
+    // Another thread may have opened it meanwhile; the loader counts the opens, one entry is enough.
+    if (IsCached(name)) return true;
+    Publish(g_libraries, new LibraryEntry{name, handle, nullptr});
     return true;
 }
 
 CommonI::RefCountPtr<CitI::IInterface> Factory::CreateInstanceRef(const Port::XUID& classId) {
-    if (g_createFilter && !g_createFilter(classId)) return nullptr;
-    const ClassEntry* entry = FindClass(StateUp(), classId);
-    if (!entry || !entry->creator) return nullptr;
+    if (CreateFilter filter = g_createFilter.load(std::memory_order_acquire); filter && !filter(classId)) return nullptr;
+    const ClassEntry* entry = FindClass(classId);
+    const ComponentCreator creator = entry ? entry->creator.load(std::memory_order_acquire) : nullptr;
+    if (!creator) return nullptr;
     // The new component starts at no references; the counted pointer takes the first.
-    return CommonI::RefCountPtr<CitI::IInterface>(entry->creator());
+    return CommonI::RefCountPtr<CitI::IInterface>(creator());
 }
 
 void Factory::RegisterClass(const Port::XUID& classId, ComponentCreator creator) {
-    FactoryState& state = StateUp();
-    if (ClassEntry* entry = FindClass(state, classId)) {
-        entry->creator = creator;
+    const std::lock_guard hold(WriterLock());
+    if (ClassEntry* entry = FindClass(classId)) {
+        entry->creator.store(creator, std::memory_order_release);
         return;
     }
-    state.classes.push_back(ClassEntry{classId.First(), classId.Second(), creator});
+    Publish(g_classes, new ClassEntry{classId.First(), classId.Second(), {creator}, nullptr});
 }
 
 bool Factory::IsRegistered(const Port::XUID& classId) {
-    const ClassEntry* entry = FindClass(StateUp(), classId);
-    return entry && entry->creator;
+    const ClassEntry* entry = FindClass(classId);
+    return entry && entry->creator.load(std::memory_order_acquire);
 }
 
 int Factory::LibraryOpenCount() { return g_libraryOpens; }
 
-void Factory::SetLoadFilter(LoadFilter filter) { g_loadFilter = filter; }
+void Factory::SetLoadFilter(LoadFilter filter) { g_loadFilter.store(filter, std::memory_order_release); }
 
-void Factory::SetCreateFilter(CreateFilter filter) { g_createFilter = filter; }
+void Factory::SetCreateFilter(CreateFilter filter) { g_createFilter.store(filter, std::memory_order_release); }
 
-FactoryInit::FactoryInit() {
-    if (g_inits++ == 0) StateUp();
-}
+FactoryInit::FactoryInit() { ++g_inits; }
 
 FactoryInit::~FactoryInit() {
-    if (--g_inits == 0) TearDown();
+    if (--g_inits == 0) {
+        const std::lock_guard hold(WriterLock());
+        TearDown();
+    }
 }
 
 int FactoryInitCount() noexcept { return g_inits; }

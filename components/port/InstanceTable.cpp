@@ -1,11 +1,17 @@
-// CitP::InstanceTable and its init object. The table lives in static storage that needs no
-// dynamic initialisation: InstanceTableInit builds it in place on the first module and takes it
-// down on the last, and a call before any module's init object builds it on first use. The
-// observer is plain data, so a death reported during static teardown still reaches it.
+// CitP::InstanceTable and its init object. The table lives in static storage that needs no dynamic
+// initialisation, so that a component born or dead during another library's static initialisation
+// or teardown is still counted. InstanceTableInit counts the modules that hold it up; the last one
+// takes the table down.
+//
+// Threads: components are born and die on every interpreter thread, so counting takes no lock. The
+// table is a list that only grows while it is up: a class's row is published with one atomic store
+// and its count is atomic. Rows are added under a lock among writers. The observer and its context
+// are one pair, swapped whole.
 #include "CitP/InstanceTable.h"
 
+#include <atomic>
+#include <mutex>
 #include <new>
-#include <vector>
 
 #include "Port/Init.h"
 
@@ -16,46 +22,59 @@ namespace {
 struct LiveCount {
     uint64_t first;
     uint64_t second;
-    long live;
+    std::atomic<long> live;
+    LiveCount* next;
 };
-using Table = std::vector<LiveCount>;
 
-alignas(Table) unsigned char g_storage[sizeof(Table)];
-Table* g_table = nullptr;
-int g_inits = 0;
-InstanceTable::Observer g_observer = nullptr;
-void* g_observerContext = nullptr;
+struct Watcher {
+    InstanceTable::Observer observer;
+    void* context;
+    const Watcher* retired;  // the pair this one replaced, kept reachable
+};
 
-Table& TableUp() noexcept {
-    if (!g_table) g_table = new (g_storage) Table();
-    return *g_table;
+std::atomic<LiveCount*> g_table{nullptr};
+std::atomic<int> g_inits{0};
+std::atomic<const Watcher*> g_watcher{nullptr};
+const Watcher* g_retired = nullptr;  // replaced pairs, under the writers' lock
+
+// Never destroyed: components may die while the process winds down.
+std::mutex& WriterLock() {
+    static std::mutex* const lock = new std::mutex;
+    return *lock;
+}
+
+LiveCount* Find(const Port::XUID& classId) noexcept {
+    for (LiveCount* entry = g_table.load(std::memory_order_acquire); entry; entry = entry->next) {
+        if (entry->first == classId.First() && entry->second == classId.Second()) return entry;
+    }
+    return nullptr;
 }
 
 void TearDown() noexcept {
-    if (!g_table) return;
-    g_table->~Table();
-    g_table = nullptr;
-}
-
-LiveCount* Find(Table& table, const Port::XUID& classId) noexcept {
-    for (LiveCount& entry : table) {
-        if (entry.first == classId.First() && entry.second == classId.Second()) return &entry;
+    LiveCount* entry = g_table.exchange(nullptr, std::memory_order_acq_rel);
+    while (entry) {
+        LiveCount* next = entry->next;
+        delete entry;
+        entry = next;
     }
-    return nullptr;
 }
 
 // Counting is a diagnosis: when no memory is left for a new class's row, that class goes uncounted
 // rather than failing the component's construction or destruction.
 void Count(const Port::XUID& classId, long change) noexcept {
-    Table& table = TableUp();
-    if (LiveCount* entry = Find(table, classId)) {
-        entry->live += change;
+    if (LiveCount* entry = Find(classId)) {
+        entry->live.fetch_add(change, std::memory_order_relaxed);
         return;
     }
-    try {
-        table.push_back(LiveCount{classId.First(), classId.Second(), change});
-    } catch (...) {
+    const std::lock_guard hold(WriterLock());
+    if (LiveCount* entry = Find(classId)) {
+        entry->live.fetch_add(change, std::memory_order_relaxed);
+        return;
     }
+    auto* entry = new (std::nothrow) LiveCount{classId.First(), classId.Second(), {change}, nullptr};
+    if (!entry) return;
+    entry->next = g_table.load(std::memory_order_relaxed);
+    g_table.store(entry, std::memory_order_release);
 }
 
 }  // namespace
@@ -63,29 +82,37 @@ void Count(const Port::XUID& classId, long change) noexcept {
 void InstanceTable::Born(const Port::XUID& classId) noexcept { Count(classId, 1); }
 
 void InstanceTable::Died(const Port::XUID& classId, const char* detail) noexcept {
-    // Without a table nothing was born since it came down (or ever), and a death late in static
-    // teardown must not build the table anew.
-    if (g_table) Count(classId, -1);
-    if (g_observer) g_observer(classId, detail, g_observerContext);
+    // Without a row nothing of the class was counted since the table came down (or ever), and a
+    // death late in static teardown must not build the table anew.
+    if (LiveCount* entry = Find(classId)) entry->live.fetch_sub(1, std::memory_order_relaxed);
+    if (const Watcher* watcher = g_watcher.load(std::memory_order_acquire))
+        watcher->observer(classId, detail, watcher->context);
 }
 
 long InstanceTable::Live(const Port::XUID& classId) noexcept {
-    if (!g_table) return 0;
-    const LiveCount* entry = Find(*g_table, classId);
-    return entry ? entry->live : 0;
+    const LiveCount* entry = Find(classId);
+    return entry ? entry->live.load(std::memory_order_relaxed) : 0;
 }
 
+// A replaced pair is kept, not freed: another thread may be calling its observer right now. Tests
+// set the observer a handful of times in a process.
 void InstanceTable::SetObserver(Observer observer, void* context) noexcept {
-    g_observer = observer;
-    g_observerContext = observer ? context : nullptr;
+    const Watcher* watcher = observer ? new (std::nothrow) Watcher{observer, context, nullptr} : nullptr;
+    const std::lock_guard hold(WriterLock());
+    const Watcher* old = g_watcher.exchange(watcher, std::memory_order_acq_rel);
+    if (old) {
+        const_cast<Watcher*>(old)->retired = g_retired;
+        g_retired = old;
+    }
 }
 
-InstanceTableInit::InstanceTableInit() {
-    if (g_inits++ == 0) TableUp();
-}
+InstanceTableInit::InstanceTableInit() { ++g_inits; }
 
 InstanceTableInit::~InstanceTableInit() {
-    if (--g_inits == 0) TearDown();
+    if (--g_inits == 0) {
+        const std::lock_guard hold(WriterLock());
+        TearDown();
+    }
 }
 
 int InstanceTableInitCount() noexcept { return g_inits; }

@@ -42,11 +42,23 @@ struct WordHash {
     size_t operator()(std::string_view word) const noexcept { return std::hash<std::string_view>{}(word); }
 };
 
+bool InKelmar(std::string_view word) noexcept {
+    return word.size() > kWordPrefix.size() && std::memcmp(word.data(), kWordPrefix.data(), kWordPrefix.size()) == 0;
+}
+
+std::string_view TextOf(Tcl_Obj* obj) noexcept {
+    int length = 0;
+    const char* text = Tcl_GetStringFromObj(obj, &length);
+    return {text, static_cast<size_t>(length)};
+}
+
+// What the registry knows of a handle that has a command. Kept by handle, so that its bookkeeping
+// never depends on a word, which a rename changes and which two interpreters may both rename to.
 struct Record {
-    PtrHandleBase* handle;
     Tcl_Interp* interp;
     Tcl_Command token;
     ValueKey key;
+    std::string word;
 };
 
 struct Pending {
@@ -55,17 +67,24 @@ struct Pending {
 };
 
 struct State {
-    std::unordered_map<std::string, Record, WordHash, std::equal_to<>> byWord;
+    std::unordered_map<const PtrHandleBase*, Record> records;
+    std::unordered_multimap<std::string, PtrHandleBase*, WordHash, std::equal_to<>> byWord;
     std::unordered_map<ValueKey, PtrHandleBase*, ValueKeyHash> byValue;
     std::vector<Pending> pending;
-    int depth = 0;  // object commands running now, nested ones included
-    bool exitHandlerSet = false;
+    std::size_t outside = 0;  // words that a rename moved out of ::kelmar::
+    int depth = 0;            // object commands running now, nested ones included
 };
 
-// Never destroyed: handles can still be ended while the process winds down.
+thread_local State* t_state = nullptr;
+
+void ThreadExit(ClientData);
+
 State& TheState() {
-    static State* state = new State;
-    return *state;
+    if (t_state == nullptr) {
+        t_state = new State;
+        Tcl_CreateThreadExitHandler(ThreadExit, nullptr);
+    }
+    return *t_state;
 }
 
 std::atomic<unsigned long> g_wordCounter{0};
@@ -75,39 +94,82 @@ void End(Handle* handle) {
     delete handle;
 }
 
-void EraseValueKey(State& state, const ValueKey& key, const PtrHandleBase* handle) {
-    auto it = state.byValue.find(key);
-    if (it != state.byValue.end() && it->second == handle) state.byValue.erase(it);
-}
-
 // Ends the pending handles of `interp`, or all of them for a null interp. Ending one may make others
 // pending (a wrapped object that lets go of its own handles), so it goes on until none is left.
-void EndPendingOf(Tcl_Interp* interp) {
-    State& state = TheState();
+void EndPendingOf(State& state, Tcl_Interp* interp) {
     std::vector<PtrHandleBase*> batch;
     for (;;) {
         batch.clear();
-        for (auto it = state.pending.begin(); it != state.pending.end();) {
-            if (interp == nullptr || it->interp == interp) {
-                batch.push_back(it->handle);
-                it = state.pending.erase(it);
-            } else {
-                ++it;
-            }
-        }
+        std::erase_if(state.pending, [&](const Pending& p) {
+            if (interp != nullptr && p.interp != interp) return false;
+            batch.push_back(p.handle);
+            return true;
+        });
         if (batch.empty()) return;
         for (PtrHandleBase* handle : batch) End(handle);
     }
 }
 
+// The thread is done with Tcl (Tcl_FinalizeThread, also at the end of the process): what waits to be
+// ended goes, and the state goes once no command is left that could still reach it.
+void ThreadExit(ClientData) {
+    State* state = t_state;
+    if (state == nullptr) return;
+    EndPendingOf(*state, nullptr);
+    if (state->records.empty() && state->pending.empty()) {
+        t_state = nullptr;
+        delete state;
+    }
+}
+
+void AddWord(State& state, const std::string& word, PtrHandleBase* handle) {
+    state.byWord.emplace(word, handle);
+    if (!InKelmar(word)) ++state.outside;
+}
+
+void DropWord(State& state, const std::string& word, const PtrHandleBase* handle) {
+    auto [first, last] = state.byWord.equal_range(std::string_view(word));
+    for (auto it = first; it != last; ++it) {
+        if (it->second != handle) continue;
+        state.byWord.erase(it);
+        if (!InKelmar(word)) --state.outside;
+        return;
+    }
+}
+
+// Removes everything the state knows of a handle's command; gives the record that was dropped.
+Record DropRecord(State& state, std::unordered_map<const PtrHandleBase*, Record>::iterator it) {
+    const PtrHandleBase* handle = it->first;
+    Record record = std::move(it->second);
+    state.records.erase(it);
+    DropWord(state, record.word, handle);
+    if (auto value = state.byValue.find(record.key); value != state.byValue.end() && value->second == handle)
+        state.byValue.erase(value);
+    return record;
+}
+
+// The handle behind `word`; of `interp` first when two interpreters renamed a handle to one name.
+PtrHandleBase* FindIn(const State& state, std::string_view word, Tcl_Interp* interp) {
+    if (!InKelmar(word) && state.outside == 0) return nullptr;
+    auto [first, last] = state.byWord.equal_range(word);
+    if (first == last) return nullptr;
+    if (interp != nullptr) {
+        for (auto it = first; it != last; ++it) {
+            auto record = state.records.find(it->second);
+            if (record != state.records.end() && record->second.interp == interp) return it->second;
+        }
+    }
+    return first->second;
+}
+
 // Counts the running object commands; the outermost one to return ends the pending handles.
 class CallDepth {
 public:
-    CallDepth() noexcept : m_state(TheState()) { ++m_state.depth; }
+    explicit CallDepth(State& state) noexcept : m_state(state) { ++m_state.depth; }
     CallDepth(const CallDepth&) = delete;
     CallDepth& operator=(const CallDepth&) = delete;
     ~CallDepth() {
-        if (--m_state.depth == 0 && !m_state.pending.empty()) EndPendingOf(nullptr);
+        if (--m_state.depth == 0 && !m_state.pending.empty()) EndPendingOf(m_state, nullptr);
     }
 
 private:
@@ -132,7 +194,7 @@ private:
 // with more words than it holds go to the heap.
 class ArgumentVector {
 public:
-    ArgumentVector(int objc, Tcl_Obj* const objv[]) {
+    ArgumentVector(const State& state, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
         if (objc > kInline) {
             m_heapSlots = std::make_unique<Slot[]>(objc);
             m_heapArgs = std::make_unique<Handle*[]>(objc);
@@ -140,7 +202,7 @@ public:
             m_args = m_heapArgs.get();
         }
         for (int i = 0; i < objc; ++i) {
-            PtrHandleBase* handle = i > 0 ? PtrHandleBase::GetHandleFromTclObj(objv[i]) : nullptr;
+            PtrHandleBase* handle = i > 0 ? FindIn(state, TextOf(objv[i]), interp) : nullptr;
             if (handle != nullptr) {
                 m_args[i] = handle;
             } else {
@@ -174,22 +236,25 @@ private:
     std::unique_ptr<Handle*[]> m_heapArgs;
 };
 
-std::string MakeWord(Tcl_Interp* interp, const char* typeName) {
+// A word that is no command of `interp` and no word of this thread yet, even where a rename took a
+// name of the form the counter makes.
+std::string MakeWord(const State& state, Tcl_Interp* interp, const char* typeName) {
     std::string word;
     do {
         word.assign(kWordPrefix);
         word += typeName != nullptr ? typeName : kDefaultTypeName;
         word += std::to_string(++g_wordCounter);
-    } while (Tcl_FindCommand(interp, word.c_str(), nullptr, TCL_GLOBAL_ONLY) != nullptr);
+    } while (state.byWord.count(std::string_view(word)) != 0 ||
+             Tcl_FindCommand(interp, word.c_str(), nullptr, TCL_GLOBAL_ONLY) != nullptr);
     return word;
 }
 
 }  // namespace
 
-std::string_view HandleRegistry::WordOf(const PtrHandleBase* handle) {
-    int length = 0;
-    const char* text = Tcl_GetStringFromObj(handle->m_word, &length);
-    return {text, static_cast<size_t>(length)};
+void HandleRegistry::SetWord(PtrHandleBase* handle, Tcl_Obj* word) {
+    Tcl_IncrRefCount(word);
+    if (handle->m_word != nullptr) Tcl_DecrRefCount(handle->m_word);
+    handle->m_word = word;
 }
 
 Tcl_Obj* HandleRegistry::HandOver(PtrHandleBase* handle, Tcl_Interp* interp) {
@@ -202,35 +267,33 @@ Tcl_Obj* HandleRegistry::HandOver(PtrHandleBase* handle, Tcl_Interp* interp) {
     }
     Attach(interp);
 
-    const ValueKey key{interp, handle->m_value, std::type_index(typeid(*handle))};
+    const ValueKey key{interp, handle->m_value,
+                       std::type_index(handle->m_identity != nullptr ? *handle->m_identity : typeid(*handle))};
     if (auto it = state.byValue.find(key); it != state.byValue.end()) {
-        handle->m_word = it->second->m_word;
-        Tcl_IncrRefCount(handle->m_word);
+        SetWord(handle, it->second->m_word);
         state.pending.push_back({handle, interp});
         return handle->m_word;
     }
 
-    std::string word = MakeWord(interp, handle->m_typeName);
+    std::string word = MakeWord(state, interp, handle->m_typeName);
     Tcl_Command token = Tcl_CreateObjCommand(interp, word.c_str(), ObjectCommand, handle, CommandDeleted);
     if (token == nullptr) {
         state.pending.push_back({handle, interp});
         Tcl_SetObjResult(interp, Tcl_ObjPrintf("cannot make the command \"%s\"", word.c_str()));
         return nullptr;
     }
-    handle->m_word = Tcl_NewStringObj(word.data(), static_cast<int>(word.size()));
-    Tcl_IncrRefCount(handle->m_word);
+    SetWord(handle, Tcl_NewStringObj(word.data(), static_cast<int>(word.size())));
+    // A script may rename the command; the word a later hand-over gives must follow it.
+    Tcl_TraceCommand(interp, word.c_str(), TCL_TRACE_RENAME, CommandRenamed, handle);
     state.byValue.emplace(key, handle);
-    state.byWord.emplace(std::move(word), Record{handle, interp, token, key});
+    AddWord(state, word, handle);
+    state.records.emplace(handle, Record{interp, token, key, std::move(word)});
     return handle->m_word;
 }
 
 PtrHandleBase* HandleRegistry::Find(std::string_view word) {
-    if (word.size() <= kWordPrefix.size() || std::memcmp(word.data(), kWordPrefix.data(), kWordPrefix.size()) != 0) {
-        return nullptr;
-    }
-    const State& state = TheState();
-    auto it = state.byWord.find(word);
-    return it == state.byWord.end() ? nullptr : it->second.handle;
+    const State* state = t_state;
+    return state != nullptr ? FindIn(*state, word, nullptr) : nullptr;
 }
 
 void HandleRegistry::Attach(Tcl_Interp* interp) {
@@ -241,50 +304,47 @@ void HandleRegistry::Attach(Tcl_Interp* interp) {
     if (Tcl_FindNamespace(interp, "::kelmar", nullptr, TCL_GLOBAL_ONLY) == nullptr) {
         Tcl_CreateNamespace(interp, "::kelmar", nullptr, nullptr);
     }
-    State& state = TheState();
-    if (!state.exitHandlerSet) {
-        state.exitHandlerSet = true;
-        Tcl_CreateExitHandler(ProcessExit, nullptr);
-    }
 }
 
 void HandleRegistry::Forget(PtrHandleBase* handle) {
-    State& state = TheState();
-    for (auto it = state.pending.begin(); it != state.pending.end(); ++it) {
+    State* state = t_state;
+    if (state == nullptr) return;
+    for (auto it = state->pending.begin(); it != state->pending.end(); ++it) {
         if (it->handle == handle) {
-            state.pending.erase(it);
+            state->pending.erase(it);
             break;
         }
     }
-    if (handle->m_word == nullptr) return;
-    auto it = state.byWord.find(WordOf(handle));
-    if (it == state.byWord.end() || it->second.handle != handle) return;
-    const Record record = it->second;
-    EraseValueKey(state, record.key, handle);
-    state.byWord.erase(it);
+    auto it = state->records.find(handle);
+    if (it == state->records.end()) return;
+    const Record record = DropRecord(*state, it);
     // The command must not outlive its handle; with the record gone its delete proc ends nothing.
     Tcl_DeleteCommandFromToken(record.interp, record.token);
 }
 
 void HandleRegistry::Rekey(PtrHandleBase* handle, void* oldValue) {
-    if (handle->m_word == nullptr || handle->m_value == oldValue) return;
-    State& state = TheState();
-    auto it = state.byWord.find(WordOf(handle));
-    if (it == state.byWord.end() || it->second.handle != handle) return;
+    State* state = t_state;
+    if (state == nullptr || handle->m_value == oldValue) return;
+    auto it = state->records.find(handle);
+    if (it == state->records.end()) return;
     Record& record = it->second;
-    EraseValueKey(state, record.key, handle);
+    if (auto value = state->byValue.find(record.key); value != state->byValue.end() && value->second == handle)
+        state->byValue.erase(value);
     record.key.value = handle->m_value;
-    state.byValue.emplace(record.key, handle);
+    state->byValue.emplace(record.key, handle);
 }
 
-void HandleRegistry::EndPending() { EndPendingOf(nullptr); }
+void HandleRegistry::EndPending() {
+    if (State* state = t_state) EndPendingOf(*state, nullptr);
+}
 
 int HandleRegistry::ObjectCommand(ClientData data, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
     auto* handle = static_cast<PtrHandleBase*>(data);
-    CallDepth depth;
-    ArgumentVector args(objc, objv);
+    State& state = TheState();
+    CallDepth depth(state);
     // Tcl is C: nothing may unwind through it.
     try {
+        ArgumentVector args(state, interp, objc, objv);
         return handle->Execute(objc, args.Data(), interp);
     } catch (const std::exception& e) {
         Tcl_SetObjResult(interp, Tcl_ObjPrintf("%s: %s", Tcl_GetString(objv[0]), e.what()));
@@ -297,23 +357,35 @@ int HandleRegistry::ObjectCommand(ClientData data, Tcl_Interp* interp, int objc,
 void HandleRegistry::CommandDeleted(ClientData data) {
     auto* handle = static_cast<PtrHandleBase*>(data);
     State& state = TheState();
-    auto it = state.byWord.find(WordOf(handle));
-    if (it == state.byWord.end() || it->second.handle != handle) return;  // its destructor runs now
-    Tcl_Interp* interp = it->second.interp;
-    EraseValueKey(state, it->second.key, handle);
-    state.byWord.erase(it);
+    auto it = state.records.find(handle);
+    if (it == state.records.end()) return;  // its destructor runs now
+    const Record record = DropRecord(state, it);
     // A running command may still hold the handle in its argument vector.
     if (state.depth > 0) {
-        state.pending.push_back({handle, interp});
+        state.pending.push_back({handle, record.interp});
     } else {
         End(handle);
     }
 }
 
-void HandleRegistry::InterpDeleted(ClientData, Tcl_Interp* interp) {
-    if (TheState().depth == 0) EndPendingOf(interp);
+void HandleRegistry::CommandRenamed(ClientData data, Tcl_Interp*, const char*, const char* newName, int flags) {
+    // Deletion comes through CommandDeleted; only a move to another name is followed here.
+    if ((flags & TCL_TRACE_DESTROYED) != 0 || newName == nullptr || *newName == '\0') return;
+    auto* handle = static_cast<PtrHandleBase*>(data);
+    State* state = t_state;
+    if (state == nullptr) return;
+    auto it = state->records.find(handle);
+    if (it == state->records.end()) return;
+    Record& record = it->second;
+    DropWord(*state, record.word, handle);
+    record.word = newName;
+    AddWord(*state, record.word, handle);
+    SetWord(handle, Tcl_NewStringObj(record.word.data(), static_cast<int>(record.word.size())));
 }
 
-void HandleRegistry::ProcessExit(ClientData) { EndPendingOf(nullptr); }
+void HandleRegistry::InterpDeleted(ClientData, Tcl_Interp* interp) {
+    State& state = TheState();
+    if (state.depth == 0) EndPendingOf(state, interp);
+}
 
 }  // namespace Script

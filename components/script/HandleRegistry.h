@@ -1,5 +1,6 @@
 // Script::HandleRegistry: the Tcl side of the pointer handles. It gives a handle its word and object
-// command, finds the handle behind a word, and ends the handles the support owns.
+// command, finds the handle behind a word, follows a word that `rename` moves, and ends the handles
+// the support owns.
 //
 // Ownership: a handle handed to Tcl belongs to its object command; deleting the command ends it
 // (ReleaseValue, then the destructor). A handle handed over for a value that already has a word under
@@ -7,7 +8,8 @@
 // once the outermost running object command returns, because its maker (a wrapper's helper, reached
 // through counted pointers) still touches it until then.
 //
-// All of it runs on the interpreters' thread; there is no lock.
+// Threads: Tcl runs an interpreter on one thread only, and a word is a command of one interpreter, so
+// each thread keeps a registry of its own and no lock is needed. Words are unique in the process.
 #pragma once
 
 #include <tcl.h>
@@ -24,7 +26,7 @@ public:
     // when the object command could not be made. The object stays owned by the handle.
     static Tcl_Obj* HandOver(PtrHandleBase* handle, Tcl_Interp* interp);
 
-    // The handle registered under `word`, or null.
+    // The handle registered under `word` on this thread, or null.
     static PtrHandleBase* Find(std::string_view word);
 
     // Brings the support up in `interp`: the ::kelmar namespace and the clean-up at its deletion.
@@ -37,15 +39,16 @@ public:
     // Called when a registered handle was assigned a new value: the (value, class) key follows it.
     static void Rekey(PtrHandleBase* handle, void* oldValue);
 
-    // Ends every handle waiting to be ended; for the end of the process.
+    // Ends every handle of this thread waiting to be ended.
     static void EndPending();
 
 private:
     static int ObjectCommand(ClientData data, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]);
     static void CommandDeleted(ClientData data);
+    static void CommandRenamed(ClientData data, Tcl_Interp* interp, const char* oldName, const char* newName,
+                               int flags);
     static void InterpDeleted(ClientData data, Tcl_Interp* interp);
-    static void ProcessExit(ClientData data);
-    static std::string_view WordOf(const PtrHandleBase* handle);
+    static void SetWord(PtrHandleBase* handle, Tcl_Obj* word);
 };
 
 }  // namespace Script

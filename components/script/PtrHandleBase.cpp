@@ -12,7 +12,12 @@ PtrHandleBase::PtrHandleBase(void* value, Tcl_Interp* interp)
 
 // A copy is a handle of its own: the word, and with it the object command, stay with the original.
 PtrHandleBase::PtrHandleBase(const PtrHandleBase& other)
-    : Handle(other), m_value(other.m_value), m_interp(other.m_interp), m_typeName(other.m_typeName), m_word(nullptr) {}
+    : Handle(other),
+      m_value(other.m_value),
+      m_interp(other.m_interp),
+      m_typeName(other.m_typeName),
+      m_identity(other.m_identity),
+      m_word(nullptr) {}
 
 PtrHandleBase& PtrHandleBase::operator=(const PtrHandleBase& other) {
     if (this == &other) return *this;

@@ -1,6 +1,8 @@
 #include "Script/TclWrapFactory.h"
 
 #include <cstdint>
+#include <mutex>
+#include <shared_mutex>
 #include <unordered_map>
 #include <utility>
 
@@ -17,26 +19,40 @@ struct FactoryKeyHash {
 
 using FactoryTable = std::unordered_map<FactoryKey, CitI::ITclWrapFactory*, FactoryKeyHash>;
 
+// Every thread that loads the package registers its factories, and any thread may make wrappers, so
+// the table is read under a shared lock and written under an exclusive one.
+struct Registry {
+    std::shared_mutex lock;
+    FactoryTable table;
+};
+
 // Factories are kept for the life of the process, so the table is never destroyed either: a library
 // that winds down after this one may still ask it.
-FactoryTable& Factories() {
-    static FactoryTable* table = new FactoryTable;
-    return *table;
+Registry& Factories() {
+    static Registry* const registry = new Registry;
+    return *registry;
 }
 
 }  // namespace
 
 bool TclWrapFactory::RegisterFactory(const Port::XUID& interfaceId, CitI::ITclWrapFactory* factory) {
     if (factory == nullptr) return false;
-    Factories()[{interfaceId.First(), interfaceId.Second()}] = factory;
+    Registry& registry = Factories();
+    const std::unique_lock hold(registry.lock);
+    registry.table[{interfaceId.First(), interfaceId.Second()}] = factory;
     return true;
 }
 
 CitI::IInterface* TclWrapFactory::CreateInstance(const Port::XUID& id, CitI::IInterface* object, Tcl_Interp* interp) {
-    const FactoryTable& table = Factories();
-    auto it = table.find({id.First(), id.Second()});
-    if (it == table.end()) return nullptr;
-    return it->second->CreateInstance(id, object, interp);
+    Registry& registry = Factories();
+    CitI::ITclWrapFactory* factory = nullptr;
+    {
+        const std::shared_lock hold(registry.lock);
+        auto it = registry.table.find({id.First(), id.Second()});
+        if (it == registry.table.end()) return nullptr;
+        factory = it->second;
+    }
+    return factory->CreateInstance(id, object, interp);
 }
 
 }  // namespace Script

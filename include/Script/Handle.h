@@ -4,7 +4,10 @@
 
 #include <tcl.h>
 
+#include <typeinfo>
+
 #include "CitI/IInterface.h"
+#include "CommonI/IRefCount.h"
 
 namespace Script {
 
@@ -63,6 +66,9 @@ public:
 
 protected:
     void SetTypeName(const char* name) { m_typeName = name; }
+    // The class whose words this handle shares: one word per value and class. A handle that differs
+    // from its base only in how it holds the value answers for the base.
+    void SetIdentity(const std::type_info& type) { m_identity = &type; }
 
 private:
     friend class HandleRegistry;
@@ -70,7 +76,8 @@ private:
     void* m_value;
     Tcl_Interp* m_interp;
     const char* m_typeName;
-    Tcl_Obj* m_word;  // the word once handed to Tcl, else null
+    const std::type_info* m_identity = nullptr;  // null: the handle's own class
+    Tcl_Obj* m_word;                             // the word once handed to Tcl, else null
 };
 
 // A handle of an object of type T. It adds no data.
@@ -87,11 +94,41 @@ public:
     }
 
     Handle* NewHandle(Tcl_Interp* interp) override { return new PtrHandle<T>(interp); }
-    // The one empty PtrHandle<T>, made on first use for this handle's interpreter; never freed.
+    // The one empty PtrHandle<T>, made on first use for this handle's interpreter; never freed. The
+    // initialisation of a local static is safe when two threads get here at once.
     Handle* GetSharedHandle() override {
-        static PtrHandle<T>* shared = nullptr;
-        if (shared == nullptr) shared = new PtrHandle<T>(GetTclInterp());
+        static PtrHandle<T>* const shared = new PtrHandle<T>(GetTclInterp());
         return shared;
+    }
+};
+
+// A handle of a plain pointer to an object that may be counted: while the support keeps the handle,
+// it holds a reference on the object when the object answers CommonI::IRefCount, so that a word a
+// script keeps never outlives what it stands for. It is still a PtrHandle<T> to every fetch.
+template <class T>
+class CountedPtrHandle final : public PtrHandle<T> {
+public:
+    CountedPtrHandle(T* value, Tcl_Interp* interp) : PtrHandle<T>(value, interp) {
+        this->SetIdentity(typeid(PtrHandle<T>));
+        CountedPtrHandle::AddRefValue();
+    }
+    CountedPtrHandle(const CountedPtrHandle&) = delete;
+    CountedPtrHandle& operator=(const CountedPtrHandle&) = delete;
+    // The reference goes back through ReleaseValue, called by whoever ends the handle.
+    ~CountedPtrHandle() override = default;
+
+    void AddRefValue() override {
+        if (CommonI::IRefCount* counter = Counter()) counter->AddRef();
+    }
+    void ReleaseValue() override {
+        if (CommonI::IRefCount* counter = Counter()) counter->Release();
+    }
+
+private:
+    CommonI::IRefCount* Counter() const {
+        void* value = nullptr;
+        if (this->GetValue(&value) != 0) return nullptr;
+        return static_cast<CommonI::IRefCount*>(static_cast<T*>(value)->GetInterface(CommonI::IRefCountID));
     }
 };
 

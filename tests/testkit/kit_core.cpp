@@ -1,6 +1,8 @@
 #include "kit_core.h"
 
+#include <atomic>
 #include <cstring>
+#include <mutex>
 #include <stdexcept>
 #include <unordered_map>
 
@@ -10,14 +12,19 @@ namespace TestKit {
 
 namespace {
 
-// Both live for the process: kit objects that Tcl still holds at exit may die after static
-// destruction, and must find them then.
-std::unordered_map<const void*, KitCore*>& Registry() {
-    static auto* registry = new std::unordered_map<const void*, KitCore*>();
+// Lives for the process: kit objects that Tcl still holds at exit may die after static destruction,
+// and must find it then. Interpreters on several threads make kit objects at once, hence the lock.
+struct Registry {
+    std::mutex lock;
+    std::unordered_map<const void*, KitCore*> objects;
+};
+
+Registry& TheRegistry() {
+    static auto* const registry = new Registry();
     return *registry;
 }
 
-long g_live = 0;
+std::atomic<long> g_live{0};
 
 std::string TextOf(Tcl_Obj* obj) {
     int length = 0;
@@ -52,12 +59,20 @@ KitCore::KitCore(const void* face, std::string name, const KitSetup& setup)
     int words = 0;
     if (setup.handler && Tcl_ListObjLength(nullptr, setup.handler, &words) == TCL_OK && words > 0)
         m_handler = TclRef(setup.handler);
-    if (m_face) Registry()[m_face] = this;
+    if (m_face) {
+        Registry& registry = TheRegistry();
+        const std::lock_guard hold(registry.lock);
+        registry.objects[m_face] = this;
+    }
     ++g_live;
 }
 
 KitCore::~KitCore() {
-    if (m_face) Registry().erase(m_face);
+    if (m_face) {
+        Registry& registry = TheRegistry();
+        const std::lock_guard hold(registry.lock);
+        registry.objects.erase(m_face);
+    }
     --g_live;
 }
 
@@ -71,9 +86,10 @@ void KitCore::ForgetCalls() noexcept { m_calls.clear(); }
 
 KitCore* KitCore::Find(const void* face) noexcept {
     if (!face) return nullptr;
-    const auto& registry = Registry();
-    const auto found = registry.find(face);
-    return found == registry.end() ? nullptr : found->second;
+    Registry& registry = TheRegistry();
+    const std::lock_guard hold(registry.lock);
+    const auto found = registry.objects.find(face);
+    return found == registry.objects.end() ? nullptr : found->second;
 }
 
 long KitCore::Live() noexcept { return g_live; }

@@ -2,6 +2,7 @@
 // without an object. Both are handed to Tcl more than once and must give the same word each time,
 // and neither is counted, so nothing else would keep them.
 #include <map>
+#include <mutex>
 
 #include "kit_kinds.h"
 
@@ -32,12 +33,14 @@ public:
 // Never destroyed: Tcl may still ask a helper for its name while the process goes down.
 template <class T>
 std::map<std::string, T*>& Standing() {
-    static auto* objects = new std::map<std::string, T*>();
+    static auto* const objects = new std::map<std::string, T*>();
     return *objects;
 }
 
 template <class T>
 T* StandingNamed(const std::string& name) {
+    static std::mutex lock;
+    const std::lock_guard hold(lock);
     T*& object = Standing<T>()[name];
     if (!object) object = new T(name.c_str());
     return object;

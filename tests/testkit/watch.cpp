@@ -1,6 +1,8 @@
 #include "watch.h"
 
+#include <atomic>
 #include <cstring>
+#include <mutex>
 #include <set>
 #include <vector>
 
@@ -34,14 +36,17 @@ struct Event {
     std::string detail;
 };
 
-// Kept for the process: components may die during static teardown and still report.
+// Kept for the process: components may die during static teardown and still report. Components
+// die on every interpreter thread, hence the lock.
 struct State {
+    std::mutex lock;
     std::vector<Event> events;
     std::set<std::string> faults;
+    std::atomic<bool> anyFault{false};  // lets the factory's filters answer without the lock
 };
 
 State& TheState() {
-    static auto* state = new State();
+    static auto* const state = new State();
     return *state;
 }
 
@@ -49,7 +54,9 @@ void OnDeath(const Port::XUID& classId, const char* detail, void*) {
     for (const Watched& watched : kWatched) {
         if (!(classId == watched.classId)) continue;
         try {
-            TheState().events.push_back(Event{&watched, watched.withDetail && detail ? detail : ""});
+            State& state = TheState();
+            const std::lock_guard hold(state.lock);
+            state.events.push_back(Event{&watched, watched.withDetail && detail ? detail : ""});
         } catch (...) {
             // Running out of memory here loses one event; the observer must not throw into Died.
         }
@@ -59,8 +66,10 @@ void OnDeath(const Port::XUID& classId, const char* detail, void*) {
 
 // The factory is asked by name, or by a path for a library elsewhere: a path matches by its file name.
 bool LoadAllowed(const char* name) {
-    const std::set<std::string>& faults = TheState().faults;
-    if (faults.empty()) return true;
+    State& state = TheState();
+    if (!state.anyFault.load(std::memory_order_acquire)) return true;
+    const std::lock_guard hold(state.lock);
+    const std::set<std::string>& faults = state.faults;
     std::string file = name;
     if (const auto slash = file.rfind('/'); slash != std::string::npos) file.erase(0, slash + 1);
     if (file.size() > 3 && file.compare(file.size() - 3, 3, ".so") == 0) file.resize(file.size() - 3);
@@ -68,8 +77,13 @@ bool LoadAllowed(const char* name) {
 }
 
 bool CreateAllowed(const Port::XUID& classId) {
-    for (const Watched& watched : kWatched)
-        if (classId == watched.classId) return TheState().faults.count(watched.word) == 0;
+    State& state = TheState();
+    if (!state.anyFault.load(std::memory_order_acquire)) return true;
+    for (const Watched& watched : kWatched) {
+        if (!(classId == watched.classId)) continue;
+        const std::lock_guard hold(state.lock);
+        return state.faults.count(watched.word) == 0;
+    }
     return true;
 }
 
@@ -82,8 +96,14 @@ void StartWatching() noexcept {
 }
 
 Tcl_Obj* TakeEvents() {
+    std::vector<Event> events;
+    {
+        State& state = TheState();
+        const std::lock_guard hold(state.lock);
+        events.swap(state.events);
+    }
     Tcl_Obj* list = Tcl_NewListObj(0, nullptr);
-    for (const Event& event : TheState().events) {
+    for (const Event& event : events) {
         Tcl_Obj* entry = Tcl_NewListObj(0, nullptr);
         Tcl_ListObjAppendElement(nullptr, entry, Tcl_NewStringObj("destroy", -1));
         Tcl_ListObjAppendElement(nullptr, entry, Tcl_NewStringObj(event.watched->word, -1));
@@ -92,7 +112,6 @@ Tcl_Obj* TakeEvents() {
                                      Tcl_NewStringObj(event.detail.data(), static_cast<int>(event.detail.size())));
         Tcl_ListObjAppendElement(nullptr, list, entry);
     }
-    TheState().events.clear();
     return list;
 }
 
@@ -114,10 +133,13 @@ bool SetFault(const std::string& what, bool on, std::string& error) {
                 "\": must be libTcltask_Support, libArgMatchKit, property, matcher or namelist";
         return false;
     }
+    State& state = TheState();
+    const std::lock_guard hold(state.lock);
     if (on)
-        TheState().faults.insert(what);
+        state.faults.insert(what);
     else
-        TheState().faults.erase(what);
+        state.faults.erase(what);
+    state.anyFault.store(!state.faults.empty(), std::memory_order_release);
     return true;
 }
 
