@@ -112,7 +112,9 @@ template <>
 int Fetch_InterfaceType<UtilI::ITclProperty>(UtilI::MITclProperty& value, Tcl_Interp* interp,
                                              Script::Handle* handle, int direction);
 
-// A plain pointer as a new PtrHandle<T> that Tcl then owns; null as the integer 0.
+// A plain pointer as a new PtrHandle<T> that Tcl then owns; null as the integer 0. The pointer
+// carries no reference, so the handle takes one of its own where the object is counted: a word that
+// outlives the object it was handed out for would otherwise reach freed memory.
 template <class T>
 int Store_Type(T* value, Tcl_Interp* interp, Script::Handle* handle, int direction) {
     if (direction == Script::IN)
@@ -123,7 +125,7 @@ int Store_Type(T* value, Tcl_Interp* interp, Script::Handle* handle, int directi
         detail::StoreNull(interp, handle, direction);
         return 0;
     }
-    auto* held = new Script::PtrHandle<T>(value, interp);
+    auto* held = new Script::CountedPtrHandle<T>(value, interp);
     if (direction == Script::OUT) held->SetVariable(interp, handle->GetString());
     else held->SetResult(interp);
     return 0;

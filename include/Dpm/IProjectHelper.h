@@ -1,5 +1,5 @@
-// Dpm::IProjectHelper: the helper a project is opened with. It travels as a raw pointer and is
-// never counted by the package.
+// Dpm::IProjectHelper: the helper a project is opened with. It travels as a raw pointer that carries
+// no reference; the handle a script gets for it holds one while it lives, when the helper is counted.
 #pragma once
 
 #include "CitI/IInterface.h"
