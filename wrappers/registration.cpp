@@ -9,10 +9,12 @@ namespace TcltaskI {
 
 namespace {
 
+// One factory per class for the process: it has no data, so every load of the package, in any
+// interpreter or thread, registers the same object again instead of a new one each time.
 template <class W>
 void Register() {
     using I = typename W::Interface;
-    auto* factory = new Script::TTclWrapFactory<W, I>();
+    static auto* const factory = new Script::TTclWrapFactory<W, I>();
     auto* face = static_cast<CitI::ITclWrapFactory*>(factory->GetInterface(CitI::ITclWrapFactoryID));
     Script::TclWrapFactory::RegisterFactory(I::IID, face);
 }
