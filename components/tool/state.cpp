@@ -48,9 +48,11 @@ void ToolState::DesignChanged() {
 }
 
 void ToolState::Shutdown() {
-    // Projects may hold registered components that hold this state; let them go first.
+    // A project may hold registered components that hold this state, another project or the project
+    // itself: each one lets go of its design and its components first, which breaks every cycle.
     auto open = std::move(projects);
     projects.clear();
+    for (auto& project : open) static_cast<ProjectComponent*>(project.get())->Drop();
     open.clear();
     timing.reset();
     floorplan.reset();
