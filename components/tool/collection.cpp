@@ -12,11 +12,24 @@ namespace kelmartool {
 
 namespace {
 
+// Keeps an interpreter allocated for as long as it lives, even when the interpreter is deleted.
+class Preserved {
+public:
+    explicit Preserved(Tcl_Interp* interp) : m_interp(interp) { Tcl_Preserve(m_interp); }
+    Preserved(const Preserved&) = delete;
+    Preserved& operator=(const Preserved&) = delete;
+    ~Preserved() { Tcl_Release(m_interp); }
+
+private:
+    Tcl_Interp* m_interp;
+};
+
 class Collection final : public Component<TcltaskI::ICollection> {
 public:
     explicit Collection(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT append_to(const Str& name, const List& items, bool unique, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> add;
         if (!CheckName(name, message) || !ResolveAll(items, add, message)) return 0;
         std::vector<std::string> members = Members(name);  // changed on a copy: failures leave it whole
@@ -28,6 +41,7 @@ public:
     }
 
     CommonI::RESULT equal(const Prop& a, const Prop& b, bool order_dependent, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> left, right;
         if (!Resolve(a, left, message) || !Resolve(b, right, message)) return 0;
         if (!order_dependent) {
@@ -38,6 +52,7 @@ public:
     }
 
     CommonI::RESULT copy(const Prop& collection, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> members;
         if (!Resolve(collection, members, message)) return 0;
         return Answer(NewList(members), result, message);
@@ -45,12 +60,17 @@ public:
 
     CommonI::RESULT foreach(const Str& variable, const Prop& collection, const Str& body, Out& result,
                             Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> members;
         if (!Resolve(collection, members, message)) return 0;
         Tcl_Interp* interp = m_state->interp;
+        // The body may have its interpreter deleted (through an alias of another one): Tcl then keeps
+        // it allocated until the walk lets go of it, and the walk stops.
+        const Preserved hold(interp);
         // One body object for the whole walk, so that Tcl compiles it once.
         TclValue script(NewText(body.c_str()));
         for (const std::string& member : members) {
+            if (Tcl_InterpDeleted(interp)) return Fail(message, kStateGone);
             if (Tcl_SetVar2Ex(interp, variable.c_str(), nullptr, NewText(member), TCL_LEAVE_ERR_MSG) == nullptr)
                 return Fail(message, Tcl_GetStringResult(interp));
             const int code = Tcl_EvalObjEx(interp, script.get(), 0);
@@ -68,6 +88,7 @@ public:
     }
 
     CommonI::RESULT index(const Prop& collection, int32_t position, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> members;
         if (!Resolve(collection, members, message)) return 0;
         if (position < 0 || static_cast<std::size_t>(position) >= members.size())
@@ -77,6 +98,7 @@ public:
     }
 
     CommonI::RESULT remove_from(const Str& name, const List& items, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         auto it = m_state->collections.find(name.c_str());
         if (it == m_state->collections.end()) return Fail(message, UnknownCollection(name));
         std::vector<std::string> drop;
@@ -87,12 +109,14 @@ public:
     }
 
     CommonI::RESULT sizeof_(const Prop& collection, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> members;
         if (!Resolve(collection, members, message)) return 0;
         return Answer(NewInt(static_cast<long long>(members.size())), result, message);
     }
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> members;
         if (!CheckName(name, message) || !Resolve(value, members, message)) return 0;
         m_state->collections[name.c_str()] = members;
@@ -100,12 +124,14 @@ public:
     }
 
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         auto it = m_state->collections.find(name.c_str());
         if (it == m_state->collections.end()) return Fail(message, UnknownCollection(name));
         return Answer(NewList(it->second), result, message);
     }
 
     CommonI::RESULT properties(Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         DictBuilder dict;
         for (const auto& [name, members] : m_state->collections) dict.Add(name, members.size());
         return Answer(dict.Take(), result, message);

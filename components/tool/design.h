@@ -227,6 +227,8 @@ struct ToolState {
     ToolState(const ToolState&) = delete;
     ToolState& operator=(const ToolState&) = delete;
 
+    // The interpreter that owns the state; null once it is gone (Shutdown). Objects of the tool may
+    // outlive it, kept by another interpreter: every operation of theirs then fails (Alive).
     Tcl_Interp* interp;
 
     // Open projects in opening order; the last is the current one.
@@ -252,8 +254,8 @@ struct ToolState {
     std::shared_ptr<TimingData> timing;
     std::shared_ptr<FloorplanData> floorplan;
 
-    // Releases every counted pointer held, so that no component keeps the state alive through a
-    // cycle; called when the interpreter goes.
+    // Forgets the interpreter and releases everything the state holds, so that no component keeps the
+    // state or a design alive through a cycle; called when the interpreter goes.
     void Shutdown();
 };
 
@@ -268,6 +270,11 @@ bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::str
 
 // The text every design operation fails with when no project is open.
 inline constexpr const char* kNoProject = "no project is open: open one with projmgr Open FILE msgVar";
+// The text every operation fails with once the interpreter of the state is gone.
+inline constexpr const char* kStateGone = "the tool state of this interpreter is gone";
+
+// False, with kStateGone in `message`, once the interpreter of `state` is gone.
+bool Alive(const ToolState& state, Port_String& message);
 
 // The analyses and the floorplan of the state, made in timing.cpp and floorplan.cpp; each answers
 // through the counted interface with no reference taken yet.

@@ -42,10 +42,12 @@ public:
     explicit Global(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return SetSetting(m_state->settings, name.c_str(), TextOf(value), true, result, message);
     }
 
     CommonI::RESULT unset(const Str& name, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         if (std::string error = m_state->settings.Unset(name.c_str()); !error.empty()) return Fail(message, error);
         const Setting* restored = m_state->settings.Find(name.c_str());
         if (restored == nullptr) return 1;  // a script's own setting is gone
@@ -53,10 +55,12 @@ public:
     }
 
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return GetSetting(m_state->settings, name.c_str(), "setting", result, message);
     }
 
     CommonI::RESULT properties(Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Answer(SettingsValue(m_state->settings, false), result, message);
     }
 

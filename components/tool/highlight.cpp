@@ -13,10 +13,12 @@ public:
     explicit Highlight(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT add(const List& items, const Str& color, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Mark(items, color, false, result, message);
     }
 
     CommonI::RESULT remove(const List& items, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> names;
         if (!ResolveItems(*m_state, items, names, message)) return 0;
         for (const std::string& name : names) m_state->highlight.erase(name);
@@ -24,30 +26,36 @@ public:
     }
 
     CommonI::RESULT new_(const List& items, const Str& color, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Mark(items, color, true, result, message);
     }
 
     CommonI::RESULT current(Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         DictBuilder dict;
         for (const auto& [name, color] : m_state->highlight) dict.Add(name, color);
         return Answer(dict.Take(), result, message);
     }
 
-    CommonI::RESULT clear(Out&, Msg&) override {
+    CommonI::RESULT clear(Out&, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         m_state->highlight.clear();
         return 1;
     }
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return SetSetting(m_state->highlightSettings, name.c_str(), TextOf(value), false, result, message);
     }
 
     // Answers without an open project: the default of `highlight add -color` asks on every call.
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return GetSetting(m_state->highlightSettings, name.c_str(), "highlight setting", result, message);
     }
 
     CommonI::RESULT properties(bool descriptors, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Answer(SettingsValue(m_state->highlightSettings, descriptors), result, message);
     }
 

@@ -61,18 +61,21 @@ public:
     explicit ObjectQuery(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT name(const Prop& object, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::string found;
         if (!One(object, found, message)) return 0;
         return Answer(NewText(found), result, message);
     }
 
     CommonI::RESULT type(const Prop& object, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::string found;
         if (!One(object, found, message)) return 0;
         return Answer(NewText(m_state->CurrentDesign()->TypeOf(found)), result, message);
     }
 
     CommonI::RESULT get(const Prop& object, const Str& property, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::string found;
         if (!One(object, found, message)) return 0;
         const Properties all = *m_state->CurrentDesign()->PropertiesOf(found);
@@ -83,6 +86,7 @@ public:
     }
 
     CommonI::RESULT properties(const Prop& object, bool descriptors, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::string found;
         if (!One(object, found, message)) return 0;
         const Properties all = *m_state->CurrentDesign()->PropertiesOf(found);

@@ -135,10 +135,12 @@ public:
     explicit ProjectManager(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT Open(const Port_String& file, Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return OpenWithHelper(file, nullptr, message);
     }
 
     CommonI::RESULT OpenWithHelper(const Port_String& file, Dpm::IProjectHelper* helper, Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         // A file already open is not read twice: it becomes the current project again.
         const std::string normal = NormalFile(file.c_str());
         for (auto& p : m_state->projects) {
@@ -150,6 +152,7 @@ public:
     }
 
     CommonI::RESULT Close(const Port_String& file, Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         const std::string normal = NormalFile(file.c_str());
         for (auto& p : m_state->projects) {
             auto* project = static_cast<ProjectComponent*>(p.get());
@@ -163,6 +166,7 @@ public:
     }
 
     CommonI::RESULT CloseCurrent(Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         if (current == nullptr) return Fail(message, kNoProject);
         message = ("closed " + current->File()).c_str();
@@ -172,30 +176,35 @@ public:
 
     CommonI::RESULT GetCurrentTclProject(CommonI::RefCountPtr<TcltaskI::ITclProject>& project,
                                          Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         project = current ? CommonI::RefCountPtr<TcltaskI::ITclProject>(current) : nullptr;
         return Report(current, message);
     }
 
     CommonI::RESULT GetCurrentHDProject(HdcI::MIHDProject& project, Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         project = current ? current->GetHDProject() : nullptr;
         return Report(current, message);
     }
 
     CommonI::RESULT GetCurrentProjectHelper(Dpm::IProjectHelper*& helper, Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         helper = current ? current->GetProjectHelper() : nullptr;
         return Report(current, message);
     }
 
     CommonI::RESULT SyncCurrent(Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         if (current == nullptr) return Report(nullptr, message);
         return current->Sync(message);
     }
 
     CommonI::RESULT ReloadCurrent(Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         if (current == nullptr) return Report(nullptr, message);
         return current->Reload(message);
@@ -217,6 +226,7 @@ public:
     explicit CurrentProject(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT OpenWithHelper(const Port_String& file, Dpm::IProjectHelper* helper, Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         CommonI::RefCountPtr<TcltaskI::ITclProjectMgr> manager(
             static_cast<TcltaskI::ITclProjectMgr*>(NewProjectManager(m_state)->GetInterface(TcltaskI::ITclProjectMgrID)));
         return manager->OpenWithHelper(file, helper, message);
@@ -238,10 +248,12 @@ public:
         return current ? current->GetProjectHelper() : nullptr;
     }
     CommonI::RESULT Sync(Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         return current ? current->Sync(message) : Fail(message, kNoProject);
     }
     CommonI::RESULT Reload(Port_String& message) override {
+        if (!Alive(*m_state, message)) return 0;
         ProjectComponent* current = CurrentOf(m_state);
         return current ? current->Reload(message) : Fail(message, kNoProject);
     }

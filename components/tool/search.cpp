@@ -22,6 +22,7 @@ public:
 
     CommonI::RESULT search(const Str& text, bool matchcase, bool exactmatch, bool regexp, bool exp, const List& type,
                            const List& in, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         const Design* design = m_state->CurrentDesign();
         if (design == nullptr) return Fail(message, kNoProject);
         const bool byExpression = regexp || exp;

@@ -15,10 +15,12 @@ public:
     explicit Selection(const StatePtr& state) : m_state(state) {}
 
     CommonI::RESULT add(const List& items, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Select(items, false, result, message);
     }
 
     CommonI::RESULT remove(const List& items, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         std::vector<std::string> names;
         if (!ResolveItems(*m_state, items, names, message)) return 0;
         std::erase_if(m_state->selection,
@@ -27,27 +29,33 @@ public:
     }
 
     CommonI::RESULT new_(const List& items, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Select(items, true, result, message);
     }
 
     CommonI::RESULT current(Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Answer(NewList(m_state->selection), result, message);
     }
 
-    CommonI::RESULT clear(Out&, Msg&) override {
+    CommonI::RESULT clear(Out&, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         m_state->selection.clear();
         return 1;
     }
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return SetSetting(m_state->selectionSettings, name.c_str(), TextOf(value), false, result, message);
     }
 
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return GetSetting(m_state->selectionSettings, name.c_str(), "selection setting", result, message);
     }
 
     CommonI::RESULT properties(bool descriptors, Out& result, Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         return Answer(SettingsValue(m_state->selectionSettings, descriptors), result, message);
     }
 

@@ -56,6 +56,14 @@ void ToolState::Shutdown() {
     open.clear();
     timing.reset();
     floorplan.reset();
+    collections.clear();
+    highlight.clear();
+    selection.clear();
+    interp = nullptr;
+}
+
+bool Alive(const ToolState& state, Port_String& message) {
+    return state.interp != nullptr || Fail(message, kStateGone) != 0;
 }
 
 bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& names, std::string& error) {

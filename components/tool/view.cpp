@@ -85,6 +85,7 @@ public:
     CommonI::RESULT zoom(bool full, bool selection, bool in, bool out, bool detailed, bool last, const Prop& name,
                          const Prop& center, const Prop& range, const Prop& xrange, const Prop& yrange, Out& result,
                          Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         const Design* d = m_state->CurrentDesign();
         if (d == nullptr) return Fail(message, kNoProject);
         if (int(full) + int(selection) + int(last) + int(Given(name)) + int(Given(range)) > 1)
@@ -136,6 +137,7 @@ public:
     CommonI::RESULT pan(bool left, bool right, bool up, bool down, bool top, bool bottom, bool farleft, bool farright,
                         const Prop& percentage, const Prop& delta, const Prop& name, Out& result,
                         Msg& message) override {
+        if (!Alive(*m_state, message)) return 0;
         const Design* d = m_state->CurrentDesign();
         if (d == nullptr) return Fail(message, kNoProject);
         if ((left && right) || (up && down) || (top && bottom) || (farleft && farright))
@@ -220,6 +222,7 @@ private:
     }
 
     CommonI::RESULT Step(int direction, Out& result, Msg& message) {
+        if (!Alive(*m_state, message)) return 0;
         if (m_state->CurrentDesign() == nullptr) return Fail(message, kNoProject);
         ViewState& view = m_state->view;
         if (direction < 0 && view.position == 0) return Fail(message, "there is no previous view");

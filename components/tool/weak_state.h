@@ -13,12 +13,13 @@ class WeakState {
 public:
     explicit WeakState(const StatePtr& state) : m_state(state) {}
 
-    // Runs `op` on the tool state, while the interpreter still has one; the state lives at least
-    // as long as the call.
+    // Runs `op` on the tool state while its interpreter lives; the state lives at least as long as
+    // the call.
     template <class Op>
     CommonI::RESULT On(Port_String& message, Op op) const {
         const StatePtr state = m_state.lock();
-        if (!state) return Fail(message, "the tool state of this interpreter is gone");
+        if (!state) return Fail(message, kStateGone);
+        if (!Alive(*state, message)) return 0;
         return op(*state);
     }
 
