@@ -74,10 +74,10 @@ public:
     ~TclWrap() override = default;
 
     void AddRefValue() override {
-        if (CommonI::IRefCount* counter = Counter()) counter->AddRef();
+        if (CommonI::IRefCount* counter = Script::CounterOf<I>(*this)) counter->AddRef();
     }
     void ReleaseValue() override {
-        if (CommonI::IRefCount* counter = Counter()) counter->Release();
+        if (CommonI::IRefCount* counter = Script::CounterOf<I>(*this)) counter->Release();
     }
 
     // The helper, for the identifiers it answers to.
@@ -154,12 +154,6 @@ private:
     static bool Matches(const char* typed, const char* name) {
         if constexpr (Compare == WordCompare::UtStr) return UT_STR::_Compare(typed, name) == 0;
         else return std::strcmp(typed, name) == 0;
-    }
-
-    CommonI::IRefCount* Counter() const {
-        I* object = nullptr;
-        if (Object(&object) != 0 || object == nullptr) return nullptr;
-        return static_cast<CommonI::IRefCount*>(object->GetInterface(CommonI::IRefCountID));
     }
 
     Script::TScriptHandleHelper<W> m_helper;

@@ -18,23 +18,9 @@ namespace {
 // and answers only GetInterface, so that an object given back as a bare IInterface or IHDProject has
 // a word that a script can ask for its other faces.
 template <class I>
-class GetInterfaceWrapper final : public PtrHandle<I> {
+class GetInterfaceWrapper final : public CountedPtrHandle<I> {
 public:
-    GetInterfaceWrapper(I* object, Tcl_Interp* interp) : PtrHandle<I>(object, interp) {
-        m_helper.SetHandle(this);
-        GetInterfaceWrapper::AddRefValue();
-    }
-    GetInterfaceWrapper(const GetInterfaceWrapper&) = delete;
-    GetInterfaceWrapper& operator=(const GetInterfaceWrapper&) = delete;
-    // The reference goes back through ReleaseValue, called by whoever ends the wrapper.
-    ~GetInterfaceWrapper() override = default;
-
-    void AddRefValue() override {
-        if (CommonI::IRefCount* counter = Counter()) counter->AddRef();
-    }
-    void ReleaseValue() override {
-        if (CommonI::IRefCount* counter = Counter()) counter->Release();
-    }
+    GetInterfaceWrapper(I* object, Tcl_Interp* interp) : CountedPtrHandle<I>(object, interp) { m_helper.SetHandle(this); }
 
     CitI::IInterface* GetScriptHandle(const Port::XUID& id) {
         if (id == CitI::IScriptHandleID || id == CitI::IInterfaceID) return &m_helper;
@@ -73,12 +59,6 @@ public:
     }
 
 private:
-    CommonI::IRefCount* Counter() {
-        void* value = nullptr;
-        if (this->GetValue(&value) != 0) return nullptr;
-        return static_cast<CommonI::IRefCount*>(static_cast<I*>(value)->GetInterface(CommonI::IRefCountID));
-    }
-
     TScriptHandleHelper<GetInterfaceWrapper> m_helper;
 };
 

@@ -102,11 +102,20 @@ public:
     }
 };
 
+// The counter of the object of type T that `handle` holds; null when it holds none or the object is
+// not counted. Every handle that counts its object counts through this.
+template <class T>
+CommonI::IRefCount* CounterOf(const PtrHandleBase& handle) {
+    void* value = nullptr;
+    if (handle.GetValue(&value) != 0 || value == nullptr) return nullptr;
+    return static_cast<CommonI::IRefCount*>(static_cast<T*>(value)->GetInterface(CommonI::IRefCountID));
+}
+
 // A handle of a plain pointer to an object that may be counted: while the support keeps the handle,
 // it holds a reference on the object when the object answers CommonI::IRefCount, so that a word a
 // script keeps never outlives what it stands for. It is still a PtrHandle<T> to every fetch.
 template <class T>
-class CountedPtrHandle final : public PtrHandle<T> {
+class CountedPtrHandle : public PtrHandle<T> {
 public:
     CountedPtrHandle(T* value, Tcl_Interp* interp) : PtrHandle<T>(value, interp) {
         this->SetIdentity(typeid(PtrHandle<T>));
@@ -118,17 +127,10 @@ public:
     ~CountedPtrHandle() override = default;
 
     void AddRefValue() override {
-        if (CommonI::IRefCount* counter = Counter()) counter->AddRef();
+        if (CommonI::IRefCount* counter = CounterOf<T>(*this)) counter->AddRef();
     }
     void ReleaseValue() override {
-        if (CommonI::IRefCount* counter = Counter()) counter->Release();
-    }
-
-private:
-    CommonI::IRefCount* Counter() const {
-        void* value = nullptr;
-        if (this->GetValue(&value) != 0) return nullptr;
-        return static_cast<CommonI::IRefCount*>(static_cast<T*>(value)->GetInterface(CommonI::IRefCountID));
+        if (CommonI::IRefCount* counter = CounterOf<T>(*this)) counter->Release();
     }
 };
 
