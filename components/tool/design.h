@@ -167,8 +167,11 @@ private:
 // JSON (design_io.cpp). Read gives the design or leaves `error` saying why, with the file name.
 std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error);
 std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error);
+// Write formats the whole design first and then replaces the file at once (file_io.h); on any
+// failure the file is as it was and `error` names the file and why.
 bool WriteDesign(const Design& design, const std::string& file, std::string& error);
-std::string FormatDesign(const Design& design);
+// The JSON text of a design; false with `error` naming the first field that cannot be written.
+bool FormatDesign(const Design& design, std::string& text, std::string& error);
 
 // ---------------------------------------------------------------------------------------------
 // Typed settings, as kept by the global settings, the highlight and the selection.

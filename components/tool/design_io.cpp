@@ -15,12 +15,13 @@
 //
 // Every object may carry "properties", an object of strings. Only "design" and "device" are
 // required; "sequential" defaults to true for the type FF.
-#include <fstream>
-#include <sstream>
+#include <cstdint>
+#include <cstdio>
 
 #include <nlohmann/json.hpp>
 
 #include "design.h"
+#include "file_io.h"
 
 namespace kelmartool {
 
@@ -231,6 +232,76 @@ ordered_json PropsJson(const Properties& p) {
     return out;
 }
 
+// The length of the valid UTF-8 sequence that starts at `text[at]`, or 0: no overlong forms, no
+// surrogates (Tcl's encoding of a NUL and of a lone surrogate are both refused), nothing beyond
+// U+10FFFF.
+std::size_t Utf8Length(std::string_view text, std::size_t at) {
+    const auto byte = [&](std::size_t i) { return static_cast<unsigned char>(text[i]); };
+    const unsigned char lead = byte(at);
+    if (lead < 0x80) return 1;
+    std::size_t length = 0;
+    std::uint32_t code = 0;
+    if (lead >= 0xC2 && lead <= 0xDF)
+        length = 2, code = lead & 0x1Fu;
+    else if ((lead & 0xF0) == 0xE0)
+        length = 3, code = lead & 0x0Fu;
+    else if (lead >= 0xF0 && lead <= 0xF4)
+        length = 4, code = lead & 0x07u;
+    else
+        return 0;
+    if (at + length > text.size()) return 0;
+    for (std::size_t i = 1; i < length; ++i) {
+        if ((byte(at + i) & 0xC0) != 0x80) return 0;
+        code = code << 6 | (byte(at + i) & 0x3Fu);
+    }
+    if (length == 3 && (code < 0x800 || (code >= 0xD800 && code <= 0xDFFF))) return 0;
+    if (length == 4 && (code < 0x10000 || code > 0x10FFFF)) return 0;
+    return length;
+}
+
+// Whether the text can go into a JSON file; else `shown` is the text with its bad bytes as \xHH.
+bool WritableText(std::string_view text, std::string& shown) {
+    bool writable = true;
+    shown.clear();
+    for (std::size_t at = 0; at < text.size();) {
+        const std::size_t length = Utf8Length(text, at);
+        if (length == 0) {
+            char escaped[5];
+            std::snprintf(escaped, sizeof escaped, "\\x%02X", static_cast<unsigned char>(text[at]));
+            shown += escaped;
+            writable = false;
+            ++at;
+        } else {
+            shown.append(text, at, length);
+            at += length;
+        }
+    }
+    return writable;
+}
+
+// The first name or text of `node` that cannot be written, by its path; empty when all can.
+std::string Unwritable(const ordered_json& node, const std::string& path) {
+    std::string shown;
+    if (node.is_string()) {
+        if (WritableText(node.get_ref<const std::string&>(), shown)) return {};
+        return (path.empty() ? std::string("the design") : path) + " is no valid UTF-8 text (a NUL or a lone surrogate " +
+               "cannot be written): \"" + shown + "\"";
+    }
+    if (node.is_array()) {
+        for (std::size_t i = 0; i < node.size(); ++i)
+            if (std::string bad = Unwritable(node[i], path + "[" + std::to_string(i) + "]"); !bad.empty()) return bad;
+    } else if (node.is_object()) {
+        for (const auto& [key, value] : node.items()) {
+            const std::string inner = path.empty() ? key : path + "." + key;
+            if (!WritableText(key, shown))
+                return (path.empty() ? std::string("the design") : path) +
+                       " has a name that is no valid UTF-8 text: \"" + shown + "\"";
+            if (std::string bad = Unwritable(value, inner); !bad.empty()) return bad;
+        }
+    }
+    return {};
+}
+
 }  // namespace
 
 std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error) {
@@ -252,20 +323,18 @@ std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error)
 }
 
 std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error) {
-    std::ifstream in(file, std::ios::binary);
-    if (!in) {
-        error = "cannot read the project file '" + file + "': no such readable file";
+    std::string text, why;
+    if (!ReadTextFile(file, text, why)) {
+        error = "cannot read the project file '" + file + "': " + why;
         return nullptr;
     }
-    std::ostringstream text;
-    text << in.rdbuf();
     std::string problem;
-    auto design = ParseDesign(text.str(), problem);
+    auto design = ParseDesign(text, problem);
     if (!design) error = "the project file '" + file + "' is malformed: " + problem;
     return design;
 }
 
-std::string FormatDesign(const Design& d) {
+bool FormatDesign(const Design& d, std::string& text, std::string& error) {
     ordered_json root = ordered_json::object();
     root["design"] = d.name;
     ordered_json device = ordered_json::object();
@@ -317,23 +386,21 @@ std::string FormatDesign(const Design& d) {
         root["floorplan"] = std::move(plan);
     }
     if (!d.properties.empty()) root["properties"] = PropsJson(d.properties);
-    return root.dump(2) + "\n";
+    // Checked before the dump, which would throw on the first bad byte without saying where.
+    if (error = Unwritable(root, ""); !error.empty()) return false;
+    try {
+        text = root.dump(2) + "\n";
+    } catch (const std::exception& e) {
+        error = e.what();
+        return false;
+    }
+    return true;
 }
 
 bool WriteDesign(const Design& design, const std::string& file, std::string& error) {
-    // Written beside the file first, so that a failed write leaves the old file whole.
-    const std::string temporary = file + ".tmp";
-    {
-        std::ofstream out(temporary, std::ios::binary | std::ios::trunc);
-        if (!out || !(out << FormatDesign(design)) || !out.flush()) {
-            error = "cannot write the project file '" + file + "'";
-            std::remove(temporary.c_str());
-            return false;
-        }
-    }
-    if (std::rename(temporary.c_str(), file.c_str()) != 0) {
-        error = "cannot replace the project file '" + file + "'";
-        std::remove(temporary.c_str());
+    std::string text, why;
+    if (!FormatDesign(design, text, why) || !WriteTextFile(file, text, why)) {
+        error = "cannot write the project file '" + file + "': " + why;
         return false;
     }
     return true;

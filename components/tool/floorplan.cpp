@@ -20,14 +20,13 @@
 //                              region of a block, zoom fit ANYTHING the whole device.
 #include <algorithm>
 #include <cstdlib>
-#include <fstream>
 #include <memory>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include "TcltaskI/IXFloorplan.h"
 #include "component.h"
+#include "file_io.h"
 #include "floorplan_model.h"
 #include "floorplan_values.h"
 #include "project.h"
@@ -66,15 +65,6 @@ std::vector<std::string> Words(const std::string& text) {
     return words;
 }
 
-bool ReadFile(const std::string& file, std::string& text) {
-    std::ifstream in(file, std::ios::binary);
-    if (!in) return false;
-    std::ostringstream buffer;
-    buffer << in.rdbuf();
-    text = buffer.str();
-    return !in.bad();
-}
-
 std::optional<ConstraintForm> FormFromWord(const std::string& word) {
     for (ConstraintForm f : {ConstraintForm::Ucf, ConstraintForm::Csv, ConstraintForm::Vhdl, ConstraintForm::Vlog})
         if (word == FormWord(f)) return f;
@@ -83,9 +73,9 @@ std::optional<ConstraintForm> FormFromWord(const std::string& word) {
 
 // Reads and parses one constraint file.
 bool Load(ConstraintForm form, const std::string& file, FloorplanConstraints& out, std::string& error) {
-    std::string text;
-    if (!ReadFile(file, text)) {
-        error = std::string("cannot read the ") + FormWord(form) + " file '" + file + "'";
+    std::string text, why;
+    if (!ReadTextFile(file, text, why)) {
+        error = std::string("cannot read the ") + FormWord(form) + " file '" + file + "': " + why;
         return false;
     }
     if (!ParseConstraints(form, text, out, error)) {
@@ -238,11 +228,10 @@ public:
         return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             std::vector<std::string> written;
             for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
-                std::ofstream out(file, std::ios::binary | std::ios::trunc);
-                out << FormatConstraints(form, plan.constraints, state.CurrentDesign()->name);
-                out.close();
-                if (!out)
-                    return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "'");
+                const std::string text = FormatConstraints(form, plan.constraints, state.CurrentDesign()->name);
+                if (std::string why; !WriteTextFile(file, text, why))
+                    return Fail(message,
+                                std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
                 written.push_back(file);
             }
             if (written.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
@@ -626,19 +615,19 @@ private:
         return 1;
     }
 
-    // Puts the working copy into the design and writes the project file; on any failure the design
-    // is as it was.
+    // Writes the design with the working copy in it to the project file, and then makes it the
+    // project's design; on any failure the file, the design and the floorplan are as they were.
     static bool Commit(ToolState& state, std::string& file, Msg& message) {
         FloorplanData* plan = Ready(state, message);
         if (!plan) return false;
         ProjectComponent* project = state.Current();
-        Design& design = *project->GetDesign();
         for (const Block& b : plan->constraints.blocks)
             if (auto r = RegionOf(b);
                 r && !(plan->device.OnDevice(r->x0, r->y0) && plan->device.OnDevice(r->x1, r->y1)))
                 return Fail(message, "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
                                          RegionText(*r) + ", which reaches beyond the device") != 0;
-        Design before = design;
+        const Design& before = *project->GetDesign();
+        Design design = before;
         design.device = plan->device;
         design.blocks = plan->constraints.blocks;
         design.prohibited = plan->constraints.prohibited;
@@ -659,13 +648,8 @@ private:
         else
             design.properties.erase(kClockLimitKey);
         std::string problem = design.Index();
-        Port_String written;
-        if (problem.empty() && project->Sync(written) != 1) problem = written.c_str();
-        if (!problem.empty()) {
-            design = std::move(before);
-            design.Index();
-            return Fail(message, "the floorplan cannot be saved: " + problem) != 0;
-        }
+        if (problem.empty()) project->Store(std::move(design), problem);
+        if (!problem.empty()) return Fail(message, "the floorplan cannot be saved: " + problem) != 0;
         file = project->File();
         if (moved) state.DesignChanged();
         plan->epoch = state.designEpoch;

@@ -20,7 +20,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
-#include <fstream>
 #include <memory>
 #include <sstream>
 #include <string>
@@ -28,6 +27,7 @@
 
 #include "TcltaskI/ITimingAnalysis.h"
 #include "component.h"
+#include "file_io.h"
 #include "property.h"
 #include "weak_state.h"
 #include "timing_model.h"
@@ -582,10 +582,8 @@ private:
                 text << "\nHigh fanout nets:\n";
                 for (const FanoutNet& n : r.highFanout) text << "  " << n.net << " " << n.fanout << "\n";
             }
-            std::ofstream out(path, std::ios::binary | std::ios::trunc);
-            out << text.str();
-            out.close();
-            if (!out) return Fail(message, "cannot write the timing report to '" + path + "'");
+            if (std::string why; !WriteTextFile(path, text.str(), why))
+                return Fail(message, "cannot write the timing report to '" + path + "': " + why);
             return Answer(NewText(path), result, message);
         });
     }
