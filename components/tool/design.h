@@ -29,6 +29,17 @@ class IXFloorplan;
 namespace kelmartool {
 
 // ---------------------------------------------------------------------------------------------
+// Limits of what a design holds, the same whether a file or a script gives it.
+
+inline constexpr int kMaxSide = 100000;    // columns or rows of a device
+inline constexpr int kMaxCount = 1000000;  // a site capacity, an sso limit or a clock limit
+// Banks of one device: their checks compare every pair, and real devices have a few dozen.
+inline constexpr int kMaxBanks = 1000;
+// A delay, setup time or period in ns: one second is far beyond any clocked design, and sums of
+// such times over any path stay finite.
+inline constexpr double kMaxTime = 1e9;
+
+// ---------------------------------------------------------------------------------------------
 // Design objects
 
 enum class Kind { Cell, Net, Port, Clock, Bank, Site };

@@ -122,24 +122,25 @@ public:
             int columns = 0, rows = 0, banks = 0, sso = 0, capacity = 0, clocks = 0;
             if (name.empty()) return Fail(message, "the floorplan needs a name");
             if (device.empty()) return Fail(message, "the device needs a name");
-            if (!WholeNumber(s3.c_str(), 1, 100000, columns))
+            if (!WholeNumber(s3.c_str(), 1, kMaxSide, columns))
                 return Fail(message,
                             "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
-            if (!WholeNumber(s4.c_str(), 1, 100000, rows))
+            if (!WholeNumber(s4.c_str(), 1, kMaxSide, rows))
                 return Fail(message, "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
             if (layout != "columns" && layout != "rows")
                 return Fail(message, "unknown bank layout '" + layout + "': use columns or rows");
             const int stripes = layout == "columns" ? columns : rows;
-            if (!WholeNumber(s5.c_str(), 1, stripes, banks))
-                return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(stripes) +
-                                         ", not '" + std::string(s5.c_str()) + "'");
-            if (!WholeNumber(s7.c_str(), 0, 1000000, sso))
+            const int most = std::min(stripes, kMaxBanks);
+            if (!WholeNumber(s5.c_str(), 1, most, banks))
+                return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(most) + ", not '" +
+                                         std::string(s5.c_str()) + "'");
+            if (!WholeNumber(s7.c_str(), 0, kMaxCount, sso))
                 return Fail(message, "the sso limit must be a whole number of at least 0, not '" +
                                          std::string(s7.c_str()) + "'");
-            if (!WholeNumber(s8.c_str(), 1, 1000000, capacity))
+            if (!WholeNumber(s8.c_str(), 1, kMaxCount, capacity))
                 return Fail(message,
                             "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
-            if (!WholeNumber(s9.c_str(), 0, 1000000, clocks))
+            if (!WholeNumber(s9.c_str(), 0, kMaxCount, clocks))
                 return Fail(message, "the clock limit must be a whole number of at least 0, not '" +
                                          std::string(s9.c_str()) + "'");
             Device d;
@@ -321,14 +322,14 @@ public:
                 if (text.empty()) return Fail(message, "the floorplan needs a name");
                 changed.name = text;
             } else if (key == "site_capacity") {
-                if (!WholeNumber(text, 1, 1000000, number))
+                if (!WholeNumber(text, 1, kMaxCount, number))
                     return Fail(message, "the site capacity must be a whole number from 1, not '" + text + "'");
                 changed.device.siteCapacity = number;
             } else if (key == "clock_limit") {
-                if (!WholeNumber(text, 0, 1000000, number))
+                if (!WholeNumber(text, 0, kMaxCount, number))
                     return Fail(message, "the clock limit must be a whole number of at least 0, not '" + text + "'");
                 changed.clockLimit = number;
-            } else if (WholeNumber(text, 0, 1000000, number)) {
+            } else if (WholeNumber(text, 0, kMaxCount, number)) {
                 for (Bank& b : changed.device.banks) b.ssoLimit = number;
             } else {
                 // A dict of bank and limit sets the named banks only.
@@ -341,7 +342,7 @@ public:
                                              [&](const Bank& b) { return b.name == words[i]; });
                     if (bank == changed.device.banks.end())
                         return Fail(message, Quote(words[i]) + " is no bank of the device");
-                    if (!WholeNumber(words[i + 1], 0, 1000000, bank->ssoLimit))
+                    if (!WholeNumber(words[i + 1], 0, kMaxCount, bank->ssoLimit))
                         return Fail(message, "the sso limit of " + Quote(words[i]) +
                                                  " must be a whole number of at least 0, not '" + words[i + 1] + "'");
                 }
@@ -448,8 +449,8 @@ public:
             if (from.empty() || from.size() != to.size())
                 return Fail(message, "the two port lists must be of the same length, and not empty");
             int dx = 0, dy = 0;
-            if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -100000, 100000, dx) ||
-                                    !WholeNumber(offset[1], -100000, 100000, dy)))
+            if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -kMaxSide, kMaxSide, dx) ||
+                                    !WholeNumber(offset[1], -kMaxSide, kMaxSide, dy)))
                 return Fail(message,
                             "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
             if (mode == "swap" && (dx != 0 || dy != 0))
@@ -604,7 +605,7 @@ private:
         for (const IoPort& p : design->ports)
             if (!p.site.empty()) fresh.constraints.ports[p.name] = p.site;
         if (auto limit = design->properties.find(kClockLimitKey); limit != design->properties.end())
-            WholeNumber(limit->second, 0, 1000000, fresh.clockLimit);
+            WholeNumber(limit->second, 0, kMaxCount, fresh.clockLimit);
         fresh.view = WholeDevice(fresh.device);
         return true;
     }
