@@ -128,6 +128,7 @@ struct Block {
     // The region, columns x0..x1 and rows y0..y1 inclusive; absent until constrained.
     std::optional<int> x0, y0, x1, y1;
     Properties constraints;
+    friend bool operator==(const Block&, const Block&) = default;
 };
 
 // What a name stands for inside one design.

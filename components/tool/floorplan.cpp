@@ -227,15 +227,22 @@ public:
     RESULT export_(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result,
                    Msg& message) override {
         return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
-            std::vector<std::string> written;
-            for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
-                const std::string text = FormatConstraints(form, plan.constraints, state.CurrentDesign()->name);
-                if (std::string why; !WriteTextFile(file, text, why))
-                    return Fail(message,
-                                std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
-                written.push_back(file);
+            // Every text is made and checked before any file is written; each file is then
+            // replaced whole or not at all.
+            const auto files = Files(ucf, csv, vhdl, vlog);
+            if (files.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
+            std::vector<std::string> texts(files.size()), written;
+            std::string why;
+            auto failed = [&](ConstraintForm form, const std::string& file) {
+                return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
+            };
+            for (std::size_t i = 0; i < files.size(); ++i)
+                if (!FormatConstraints(files[i].first, plan.constraints, state.CurrentDesign()->name, texts[i], why))
+                    return failed(files[i].first, files[i].second);
+            for (std::size_t i = 0; i < files.size(); ++i) {
+                if (!WriteTextFile(files[i].second, texts[i], why)) return failed(files[i].first, files[i].second);
+                written.push_back(files[i].second);
             }
-            if (written.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
             return Answer(NewList(written), result, message);
         });
     }

@@ -39,6 +39,7 @@ struct FloorplanConstraints {
     std::vector<Block> blocks;
     std::set<std::string> prohibited;          // site names
     std::map<std::string, std::string> ports;  // port -> site
+    friend bool operator==(const FloorplanConstraints&, const FloorplanConstraints&) = default;
 };
 
 struct FloorplanData {
@@ -59,7 +60,11 @@ void MergeConstraints(FloorplanConstraints& base, const FloorplanConstraints& ex
 // The four constraint file forms (floorplan_io.cpp documents each).
 enum class ConstraintForm { Ucf, Csv, Vhdl, Vlog };
 const char* FormWord(ConstraintForm form) noexcept;
-std::string FormatConstraints(ConstraintForm form, const FloorplanConstraints& constraints, const std::string& design);
+// The text of the constraints in one form, when the form holds them exactly: read back, the text
+// gives the same constraints. False otherwise, with `error` naming the first item the form cannot
+// hold (a line break in a value, a port name that is no word of vhdl, ...).
+bool FormatConstraints(ConstraintForm form, const FloorplanConstraints& constraints, const std::string& design,
+                       std::string& text, std::string& error);
 // Reads the text of one form; the error names the line. Only the syntax is checked here.
 bool ParseConstraints(ConstraintForm form, const std::string& text, FloorplanConstraints& out, std::string& error);
 
