@@ -134,7 +134,8 @@ std::string Design::Index() {
 std::optional<ObjectRef> Design::Find(std::string_view objectName) const {
     if (auto it = m_index.find(objectName); it != m_index.end()) return it->second;
     if (auto site = device.ParseSite(objectName))
-        return ObjectRef{Kind::Site, static_cast<std::size_t>(site->x + site->y * device.columns)};
+        return ObjectRef{Kind::Site, static_cast<std::size_t>(site->y) * static_cast<std::size_t>(device.columns) +
+                                         static_cast<std::size_t>(site->x)};
     return std::nullopt;
 }
 
@@ -254,7 +255,7 @@ std::optional<Properties> Design::PropertiesOf(std::string_view objectName) cons
             p["x1"] = std::to_string(b.x1);
             p["y1"] = std::to_string(b.y1);
             p["sso_limit"] = std::to_string(b.ssoLimit);
-            p["sites"] = std::to_string((b.x1 - b.x0 + 1) * (b.y1 - b.y0 + 1));
+            p["sites"] = std::to_string((static_cast<long long>(b.x1) - b.x0 + 1) * (static_cast<long long>(b.y1) - b.y0 + 1));
             break;
         }
         case Kind::Site: {

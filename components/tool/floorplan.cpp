@@ -44,6 +44,9 @@ constexpr const char* kNameKey = "floorplan_name";
 constexpr const char* kClockLimitKey = "clock_limit";
 
 const std::vector<std::string> kWritable{"name", "site_capacity", "sso_limit", "clock_limit"};
+// Sites prohibit may name in all: each is a name kept and answered, and a range of a large device
+// would otherwise ask for billions of them.
+constexpr long long kMaxProhibited = 1000000;
 std::string Quote(const std::string& name) { return "'" + name + "'"; }
 
 bool WholeNumber(const std::string& text, long long low, long long high, int& out) {
@@ -408,7 +411,7 @@ public:
                     SetRegion(b, r);
                 } else {
                     b.constraints[key] =
-                        key == "capacity" ? std::to_string(std::strtoll(text.c_str(), nullptr, 10)) : text;
+                        key == "capacity" ? std::to_string(*ParseCapacity(text)) : text;
                 }
             }
             return AnswerBlocks(plan, std::move(changed), names, result, message);
@@ -741,13 +744,23 @@ private:
                 if (!plan.device.OnDevice(r.x0, r.y0) || !plan.device.OnDevice(r.x1, r.y1))
                     return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan.device.columns) +
                                              " x " + std::to_string(plan.device.rows) + " sites)");
+                if (!prohibit) {
+                    // A walk over what is prohibited, not over the range, which may be huge.
+                    std::erase_if(changed, [&r](const std::string& site) {
+                        int sx = 0, sy = 0;
+                        return ParseSiteName(site, sx, sy) && r.Contains(sx, sy);
+                    });
+                    continue;
+                }
+                if (r.Sites() > kMaxProhibited)
+                    return Fail(message, Quote(w) + " covers " + std::to_string(r.Sites()) +
+                                             " sites; a floorplan prohibits at most " +
+                                             std::to_string(kMaxProhibited) + " sites");
                 for (int yy = r.y0; yy <= r.y1; ++yy)
-                    for (int xx = r.x0; xx <= r.x1; ++xx) {
-                        if (prohibit)
-                            changed.insert(Device::SiteName(xx, yy));
-                        else
-                            changed.erase(Device::SiteName(xx, yy));
-                    }
+                    for (int xx = r.x0; xx <= r.x1; ++xx) changed.insert(Device::SiteName(xx, yy));
+                if (static_cast<long long>(changed.size()) > kMaxProhibited)
+                    return Fail(message, "the floorplan would prohibit " + std::to_string(changed.size()) +
+                                             " sites, more than " + std::to_string(kMaxProhibited));
             }
             if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
             plan.constraints.prohibited = std::move(changed);
