@@ -354,6 +354,12 @@ void SettingTable::Define(const std::string& settingName, SettingType type, cons
     m_settings[settingName] = std::move(s);
 }
 
+void SettingTable::Define(const std::string& settingName, SettingType type, const std::string& value,
+                          const std::string& description, Setting::Bounds bounds) {
+    Define(settingName, type, value, description);
+    m_settings[settingName].bounds = bounds;
+}
+
 std::string SettingTable::Set(const std::string& settingName, const std::string& text, bool allowNew) {
     auto it = m_settings.find(settingName);
     if (it == m_settings.end()) {
@@ -376,6 +382,12 @@ std::string SettingTable::Set(const std::string& settingName, const std::string&
         }
         return "bad value '" + text + "' for setting '" + settingName + "': expected " + expected;
     }
+    if (s.bounds) {
+        const double number = std::strtod(value->c_str(), nullptr);
+        if (number < s.bounds->low || number > s.bounds->high)
+            return "bad value '" + text + "' for setting '" + settingName + "': expected a value from " +
+                   Num(s.bounds->low) + " to " + Num(s.bounds->high);
+    }
     s.value = *value;
     return {};
 }
@@ -393,6 +405,22 @@ std::string SettingTable::Unset(const std::string& settingName) {
 const Setting* SettingTable::Find(const std::string& settingName) const {
     auto it = m_settings.find(settingName);
     return it == m_settings.end() ? nullptr : &it->second;
+}
+
+long long SettingTable::Integer(const std::string& settingName, long long fallback) const {
+    const Setting* s = Find(settingName);
+    long long n = 0;
+    if (s == nullptr ||
+        std::from_chars(s->value.data(), s->value.data() + s->value.size(), n).ec != std::errc())
+        return fallback;
+    return n;
+}
+
+double SettingTable::Number(const std::string& settingName, double fallback) const {
+    const Setting* s = Find(settingName);
+    char* end = nullptr;
+    const double d = s ? std::strtod(s->value.c_str(), &end) : fallback;
+    return s && end != s->value.c_str() && std::isfinite(d) ? d : fallback;
 }
 
 }  // namespace kelmartool

@@ -197,6 +197,11 @@ struct Setting {
     std::string defaultValue;  // what unset restores; a user setting has none and goes
     std::string description;
     std::vector<std::string> choices;  // for Choice
+    // For Int and Double: the values the users of the setting can work with, both included.
+    struct Bounds {
+        double low, high;
+    };
+    std::optional<Bounds> bounds;
     bool builtIn = false;
 };
 
@@ -204,12 +209,18 @@ class SettingTable {
 public:
     void Define(const std::string& name, SettingType type, const std::string& value, const std::string& description,
                 std::vector<std::string> choices = {});
+    void Define(const std::string& name, SettingType type, const std::string& value, const std::string& description,
+                Setting::Bounds bounds);
     // Checks `text` against the setting's type and stores its canonical form. A name that is not
     // defined becomes a user string setting when `allowNew` is true. Empty on success.
     std::string Set(const std::string& name, const std::string& text, bool allowNew);
     // A built-in setting goes back to its default, a user setting goes. Empty on success.
     std::string Unset(const std::string& name);
     const Setting* Find(const std::string& name) const;
+    // The value of a built-in Int or Double setting, read from its canonical text; `fallback` when
+    // there is no such setting.
+    long long Integer(const std::string& name, long long fallback) const;
+    double Number(const std::string& name, double fallback) const;
     const std::map<std::string, Setting>& All() const noexcept { return m_settings; }
 
 private:

@@ -274,8 +274,7 @@ public:
             if (a.result && !overwrite)
                 return Fail(message, "timing analysis '" + a.id +
                                          "' has a result already: run it with -overwrite to replace the result");
-            int pathLimit = 0;
-            if (const Setting* s = state.settings.Find("max_paths")) pathLimit = std::atoi(s->value.c_str());
+            const int pathLimit = static_cast<int>(state.settings.Integer("max_paths", 0));
             TimingResult fresh;
             std::string error;
             if (!RunTiming(*design, a.settings, pathLimit, fresh, error))
