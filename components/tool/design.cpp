@@ -164,27 +164,6 @@ Block* Design::FindBlock(std::string_view n) {
     return nullptr;
 }
 
-std::vector<std::string> Design::Names(Kind kind) const {
-    std::vector<std::string> out;
-    auto collect = [&out](const auto& items) {
-        out.reserve(items.size());
-        for (const auto& item : items) out.push_back(item.name);
-    };
-    switch (kind) {
-        case Kind::Cell: collect(cells); break;
-        case Kind::Net: collect(nets); break;
-        case Kind::Port: collect(ports); break;
-        case Kind::Clock: collect(clocks); break;
-        case Kind::Bank: collect(device.banks); break;
-        case Kind::Site:
-            out.reserve(static_cast<std::size_t>(device.columns) * static_cast<std::size_t>(device.rows));
-            for (int y = 0; y < device.rows; ++y)
-                for (int x = 0; x < device.columns; ++x) out.push_back(Device::SiteName(x, y));
-            break;
-    }
-    return out;
-}
-
 std::string Design::TypeOf(std::string_view objectName) const {
     const auto ref = Find(objectName);
     return ref ? KindWord(ref->kind) : "";

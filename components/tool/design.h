@@ -165,8 +165,6 @@ public:
     Clock* FindClock(std::string_view name);
     Block* FindBlock(std::string_view name);
 
-    // Every object name of one kind, in design order (sites row by row).
-    std::vector<std::string> Names(Kind kind) const;
     // The type word of a named object ("cell", ...), or empty.
     std::string TypeOf(std::string_view name) const;
     // The properties of a named object in name order, built-in ones included, or nothing.
