@@ -479,11 +479,15 @@ private:
         const Design* design = state.CurrentDesign();
         double number = 0;
         const bool numeric = IsNumber(value, number);
+        // Times beyond kMaxTime would let the sums of a run overflow to infinity.
+        const std::string tooLarge = "the constraint " + name + " must be at most " +
+                                     std::to_string(static_cast<long long>(kMaxTime)) + " ns, not '" + value + "'";
         if (type == "period") {
             if (!design) return kNoProject;
             if (!hasObject || !design->FindClock(object))
                 return "the constraint period:CLOCK needs a clock of the design";
             if (!numeric || number <= 0) return "a clock period must be a positive number, not '" + value + "'";
+            if (number > kMaxTime) return tooLarge;
             return {};
         }
         if (type == "input_delay" || type == "output_delay") {
@@ -496,10 +500,12 @@ private:
                            " port of the design, not '" + object + "'";
             }
             if (!numeric || number < 0) return "a delay must be a number of at least 0, not '" + value + "'";
+            if (number > kMaxTime) return tooLarge;
             return {};
         }
         if (type == "uncertainty" && !hasObject) {
             if (!numeric || number < 0) return "the uncertainty must be a number of at least 0, not '" + value + "'";
+            if (number > kMaxTime) return tooLarge;
             return {};
         }
         if (type == "reference_clock" && !hasObject) {
