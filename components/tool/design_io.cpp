@@ -17,6 +17,7 @@
 // required; "sequential" defaults to true for the type FF.
 #include <cstdint>
 #include <cstdio>
+#include <utility>
 
 #include <nlohmann/json.hpp>
 
@@ -69,9 +70,10 @@ public:
             return fallback;
         }
         const auto& v = m_node.at(key);
-        // Unsigned and signed JSON integers both, compared before any narrowing.
-        const bool fits = v.is_number_unsigned()   ? v.get<std::uint64_t>() <= static_cast<std::uint64_t>(high)
-                          : v.is_number_integer() ? v.get<std::int64_t>() >= low && v.get<std::int64_t>() <= high
+        // Compared before any narrowing; the parser gives a number without a sign as unsigned.
+        const auto inRange = [low, high](auto n) { return std::cmp_greater_equal(n, low) && std::cmp_less_equal(n, high); };
+        const bool fits = v.is_number_unsigned()  ? inRange(v.get<std::uint64_t>())
+                          : v.is_number_integer() ? inRange(v.get<std::int64_t>())
                                                   : false;
         if (!fits)
             Bad(key, "must be a whole number from " + std::to_string(low) + " to " + std::to_string(high));
