@@ -134,7 +134,8 @@ std::string Design::Index() {
 std::optional<ObjectRef> Design::Find(std::string_view objectName) const {
     if (auto it = m_index.find(objectName); it != m_index.end()) return it->second;
     if (auto site = device.ParseSite(objectName))
-        return ObjectRef{Kind::Site, static_cast<std::size_t>(site->x + site->y * device.columns)};
+        return ObjectRef{Kind::Site, static_cast<std::size_t>(site->y) * static_cast<std::size_t>(device.columns) +
+                                         static_cast<std::size_t>(site->x)};
     return std::nullopt;
 }
 
@@ -161,27 +162,6 @@ Block* Design::FindBlock(std::string_view n) {
     for (Block& b : blocks)
         if (b.name == n) return &b;
     return nullptr;
-}
-
-std::vector<std::string> Design::Names(Kind kind) const {
-    std::vector<std::string> out;
-    auto collect = [&out](const auto& items) {
-        out.reserve(items.size());
-        for (const auto& item : items) out.push_back(item.name);
-    };
-    switch (kind) {
-        case Kind::Cell: collect(cells); break;
-        case Kind::Net: collect(nets); break;
-        case Kind::Port: collect(ports); break;
-        case Kind::Clock: collect(clocks); break;
-        case Kind::Bank: collect(device.banks); break;
-        case Kind::Site:
-            out.reserve(static_cast<std::size_t>(device.columns) * static_cast<std::size_t>(device.rows));
-            for (int y = 0; y < device.rows; ++y)
-                for (int x = 0; x < device.columns; ++x) out.push_back(Device::SiteName(x, y));
-            break;
-    }
-    return out;
 }
 
 std::string Design::TypeOf(std::string_view objectName) const {
@@ -254,7 +234,7 @@ std::optional<Properties> Design::PropertiesOf(std::string_view objectName) cons
             p["x1"] = std::to_string(b.x1);
             p["y1"] = std::to_string(b.y1);
             p["sso_limit"] = std::to_string(b.ssoLimit);
-            p["sites"] = std::to_string((b.x1 - b.x0 + 1) * (b.y1 - b.y0 + 1));
+            p["sites"] = std::to_string((static_cast<long long>(b.x1) - b.x0 + 1) * (static_cast<long long>(b.y1) - b.y0 + 1));
             break;
         }
         case Kind::Site: {
@@ -353,6 +333,12 @@ void SettingTable::Define(const std::string& settingName, SettingType type, cons
     m_settings[settingName] = std::move(s);
 }
 
+void SettingTable::Define(const std::string& settingName, SettingType type, const std::string& value,
+                          const std::string& description, Setting::Bounds bounds) {
+    Define(settingName, type, value, description);
+    m_settings[settingName].bounds = bounds;
+}
+
 std::string SettingTable::Set(const std::string& settingName, const std::string& text, bool allowNew) {
     auto it = m_settings.find(settingName);
     if (it == m_settings.end()) {
@@ -375,6 +361,12 @@ std::string SettingTable::Set(const std::string& settingName, const std::string&
         }
         return "bad value '" + text + "' for setting '" + settingName + "': expected " + expected;
     }
+    if (s.bounds) {
+        const double number = std::strtod(value->c_str(), nullptr);
+        if (number < s.bounds->low || number > s.bounds->high)
+            return "bad value '" + text + "' for setting '" + settingName + "': expected a value from " +
+                   Num(s.bounds->low) + " to " + Num(s.bounds->high);
+    }
     s.value = *value;
     return {};
 }
@@ -392,6 +384,22 @@ std::string SettingTable::Unset(const std::string& settingName) {
 const Setting* SettingTable::Find(const std::string& settingName) const {
     auto it = m_settings.find(settingName);
     return it == m_settings.end() ? nullptr : &it->second;
+}
+
+long long SettingTable::Integer(const std::string& settingName, long long fallback) const {
+    const Setting* s = Find(settingName);
+    long long n = 0;
+    if (s == nullptr ||
+        std::from_chars(s->value.data(), s->value.data() + s->value.size(), n).ec != std::errc())
+        return fallback;
+    return n;
+}
+
+double SettingTable::Number(const std::string& settingName, double fallback) const {
+    const Setting* s = Find(settingName);
+    char* end = nullptr;
+    const double d = s ? std::strtod(s->value.c_str(), &end) : fallback;
+    return s && end != s->value.c_str() && std::isfinite(d) ? d : fallback;
 }
 
 }  // namespace kelmartool

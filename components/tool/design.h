@@ -29,6 +29,17 @@ class IXFloorplan;
 namespace kelmartool {
 
 // ---------------------------------------------------------------------------------------------
+// Limits of what a design holds, the same whether a file or a script gives it.
+
+inline constexpr int kMaxSide = 100000;    // columns or rows of a device
+inline constexpr int kMaxCount = 1000000;  // a site capacity, an sso limit or a clock limit
+// Banks of one device: their checks compare every pair, and real devices have a few dozen.
+inline constexpr int kMaxBanks = 1000;
+// A delay, setup time or period in ns: one second is far beyond any clocked design, and sums of
+// such times over any path stay finite.
+inline constexpr double kMaxTime = 1e9;
+
+// ---------------------------------------------------------------------------------------------
 // Design objects
 
 enum class Kind { Cell, Net, Port, Clock, Bank, Site };
@@ -117,6 +128,7 @@ struct Block {
     // The region, columns x0..x1 and rows y0..y1 inclusive; absent until constrained.
     std::optional<int> x0, y0, x1, y1;
     Properties constraints;
+    friend bool operator==(const Block&, const Block&) = default;
 };
 
 // What a name stands for inside one design.
@@ -153,8 +165,6 @@ public:
     Clock* FindClock(std::string_view name);
     Block* FindBlock(std::string_view name);
 
-    // Every object name of one kind, in design order (sites row by row).
-    std::vector<std::string> Names(Kind kind) const;
     // The type word of a named object ("cell", ...), or empty.
     std::string TypeOf(std::string_view name) const;
     // The properties of a named object in name order, built-in ones included, or nothing.
@@ -167,8 +177,11 @@ private:
 // JSON (design_io.cpp). Read gives the design or leaves `error` saying why, with the file name.
 std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error);
 std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error);
+// Write formats the whole design first and then replaces the file at once (file_io.h); on any
+// failure the file is as it was and `error` names the file and why.
 bool WriteDesign(const Design& design, const std::string& file, std::string& error);
-std::string FormatDesign(const Design& design);
+// The JSON text of a design; false with `error` naming the first field that cannot be written.
+bool FormatDesign(const Design& design, std::string& text, std::string& error);
 
 // ---------------------------------------------------------------------------------------------
 // Typed settings, as kept by the global settings, the highlight and the selection.
@@ -182,6 +195,11 @@ struct Setting {
     std::string defaultValue;  // what unset restores; a user setting has none and goes
     std::string description;
     std::vector<std::string> choices;  // for Choice
+    // For Int and Double: the values the users of the setting can work with, both included.
+    struct Bounds {
+        double low, high;
+    };
+    std::optional<Bounds> bounds;
     bool builtIn = false;
 };
 
@@ -189,12 +207,18 @@ class SettingTable {
 public:
     void Define(const std::string& name, SettingType type, const std::string& value, const std::string& description,
                 std::vector<std::string> choices = {});
+    void Define(const std::string& name, SettingType type, const std::string& value, const std::string& description,
+                Setting::Bounds bounds);
     // Checks `text` against the setting's type and stores its canonical form. A name that is not
     // defined becomes a user string setting when `allowNew` is true. Empty on success.
     std::string Set(const std::string& name, const std::string& text, bool allowNew);
     // A built-in setting goes back to its default, a user setting goes. Empty on success.
     std::string Unset(const std::string& name);
     const Setting* Find(const std::string& name) const;
+    // The value of a built-in Int or Double setting, read from its canonical text; `fallback` when
+    // there is no such setting.
+    long long Integer(const std::string& name, long long fallback) const;
+    double Number(const std::string& name, double fallback) const;
     const std::map<std::string, Setting>& All() const noexcept { return m_settings; }
 
 private:

@@ -15,12 +15,14 @@
 //
 // Every object may carry "properties", an object of strings. Only "design" and "device" are
 // required; "sequential" defaults to true for the type FF.
-#include <fstream>
-#include <sstream>
+#include <cstdint>
+#include <cstdio>
+#include <utility>
 
 #include <nlohmann/json.hpp>
 
 #include "design.h"
+#include "file_io.h"
 
 namespace kelmartool {
 
@@ -28,10 +30,18 @@ namespace {
 
 using nlohmann::ordered_json;
 
-// A field that is not what it should be; the text names the field by its path.
+// A field that is not what it should be; the text names the field by its path and its value.
 struct BadField {
     std::string text;
 };
+
+// A value as a message shows it: its JSON text, cut short when it is long.
+std::string Shown(const ordered_json& value) {
+    std::string text = value.dump(-1, ' ', false, ordered_json::error_handler_t::replace);
+    constexpr std::size_t kLongest = 60;
+    if (text.size() > kLongest) text = text.substr(0, kLongest) + "...";
+    return text;
+}
 
 class Reader {
 public:
@@ -42,37 +52,47 @@ public:
     std::string Text(const char* key, bool required = false, const std::string& fallback = {}) const {
         if (!Has(key)) return Missing(key, required, fallback);
         const auto& v = m_node.at(key);
-        if (!v.is_string()) throw BadField{Path(key) + " must be a string"};
+        if (!v.is_string()) Bad(key, "must be a string");
         return v.get<std::string>();
     }
-    double Number(const char* key, double fallback = 0) const {
-        if (!Has(key)) return fallback;
+    // A time in ns; the parser gives only finite numbers, the upper bound keeps sums of them finite.
+    double Time(const char* key) const {
+        if (!Has(key)) return 0;
         const auto& v = m_node.at(key);
-        if (!v.is_number()) throw BadField{Path(key) + " must be a number"};
-        return v.get<double>();
+        if (!v.is_number()) Bad(key, "must be a number");
+        const double time = v.get<double>();
+        if (time > kMaxTime) Bad(key, "must be a number of at most " + std::to_string(static_cast<long long>(kMaxTime)));
+        return time;
     }
-    int Integer(const char* key, bool required = false, int fallback = 0) const {
+    int Integer(const char* key, int low, int high, bool required = false, int fallback = 0) const {
         if (!Has(key)) {
             if (required) throw BadField{Path(key) + " is missing"};
             return fallback;
         }
         const auto& v = m_node.at(key);
-        if (!v.is_number_integer()) throw BadField{Path(key) + " must be an integer"};
-        return v.get<int>();
+        // Compared before any narrowing; the parser gives a number without a sign as unsigned.
+        const auto inRange = [low, high](auto n) { return std::cmp_greater_equal(n, low) && std::cmp_less_equal(n, high); };
+        const bool fits = v.is_number_unsigned()  ? inRange(v.get<std::uint64_t>())
+                          : v.is_number_integer() ? inRange(v.get<std::int64_t>())
+                                                  : false;
+        if (!fits)
+            Bad(key, "must be a whole number from " + std::to_string(low) + " to " + std::to_string(high));
+        return static_cast<int>(v.get<std::int64_t>());
     }
     bool Flag(const char* key, bool fallback) const {
         if (!Has(key)) return fallback;
         const auto& v = m_node.at(key);
-        if (!v.is_boolean()) throw BadField{Path(key) + " must be true or false"};
+        if (!v.is_boolean()) Bad(key, "must be true or false");
         return v.get<bool>();
     }
     std::vector<std::string> Words(const char* key) const {
         std::vector<std::string> out;
         if (!Has(key)) return out;
         const auto& v = m_node.at(key);
-        if (!v.is_array()) throw BadField{Path(key) + " must be a list of names"};
+        if (!v.is_array()) Bad(key, "must be a list of names");
         for (std::size_t i = 0; i < v.size(); ++i) {
-            if (!v[i].is_string()) throw BadField{Path(key) + "[" + std::to_string(i) + "] must be a string"};
+            if (!v[i].is_string())
+                throw BadField{Path(key) + "[" + std::to_string(i) + "] must be a string, not " + Shown(v[i])};
             out.push_back(v[i].get<std::string>());
         }
         return out;
@@ -81,26 +101,28 @@ public:
         Properties out;
         if (!Has(key)) return out;
         const auto& v = m_node.at(key);
-        if (!v.is_object()) throw BadField{Path(key) + " must be an object"};
+        if (!v.is_object()) Bad(key, "must be an object");
         for (const auto& [k, value] : v.items()) {
             if (value.is_string())
                 out[k] = value.get<std::string>();
             else if (value.is_primitive())
                 out[k] = value.dump();
             else
-                throw BadField{Path(key) + "." + k + " must be a plain value"};
+                throw BadField{Path(key) + "." + k + " must be a plain value, not " + Shown(value)};
         }
         return out;
     }
     // The elements of a list of objects, each with its path.
-    std::vector<Reader> Items(const char* key) const {
+    std::vector<Reader> Items(const char* key, std::size_t most = SIZE_MAX) const {
         std::vector<Reader> out;
         if (!Has(key)) return out;
         const auto& v = m_node.at(key);
-        if (!v.is_array()) throw BadField{Path(key) + " must be a list"};
+        if (!v.is_array()) Bad(key, "must be a list");
+        if (v.size() > most) throw BadField{Path(key) + " holds " + std::to_string(v.size()) + " items, more than " +
+                                            std::to_string(most)};
         for (std::size_t i = 0; i < v.size(); ++i) {
             std::string path = Path(key) + "[" + std::to_string(i) + "]";
-            if (!v[i].is_object()) throw BadField{path + " must be an object"};
+            if (!v[i].is_object()) throw BadField{path + " must be an object, not " + Shown(v[i])};
             out.emplace_back(v[i], std::move(path));
         }
         return out;
@@ -112,7 +134,7 @@ public:
             return Reader(empty, Path(key));
         }
         const auto& v = m_node.at(key);
-        if (!v.is_object()) throw BadField{Path(key) + " must be an object"};
+        if (!v.is_object()) Bad(key, "must be an object");
         return Reader(v, Path(key));
     }
     std::string Path(const char* key) const { return m_path.empty() ? key : m_path + "." + key; }
@@ -121,6 +143,9 @@ private:
     std::string Missing(const char* key, bool required, const std::string& fallback) const {
         if (required) throw BadField{Path(key) + " is missing"};
         return fallback;
+    }
+    [[noreturn]] void Bad(const char* key, const std::string& what) const {
+        throw BadField{Path(key) + " " + what + ", not " + Shown(m_node.at(key))};
     }
 
     const ordered_json& m_node;
@@ -154,22 +179,20 @@ std::unique_ptr<Design> Build(const ordered_json& root) {
     Reader dev = top.Child("device", true);
     Device& device = design->device;
     device.name = dev.Text("name", false, "device");
-    device.columns = dev.Integer("columns", true);
-    device.rows = dev.Integer("rows", true);
-    device.siteCapacity = dev.Integer("site_capacity", false, 1);
-    if (device.columns <= 0 || device.rows <= 0 || device.columns > 100000 || device.rows > 100000)
-        throw BadField{"device.columns and device.rows must lie between 1 and 100000"};
-    for (const Reader& r : dev.Items("banks")) {
+    device.columns = dev.Integer("columns", 1, kMaxSide, true);
+    device.rows = dev.Integer("rows", 1, kMaxSide, true);
+    device.siteCapacity = dev.Integer("site_capacity", 1, kMaxCount, false, 1);
+    for (const Reader& r : dev.Items("banks", kMaxBanks)) {
         Bank b;
         b.name = r.Text("name", true);
         ParseRange(device, r.Text("sites", true), r.Path("sites"), b.x0, b.y0, b.x1, b.y1);
-        b.ssoLimit = r.Integer("sso_limit", false, 0);
+        b.ssoLimit = r.Integer("sso_limit", 0, kMaxCount);
         device.banks.push_back(std::move(b));
     }
     for (const Reader& r : top.Items("clocks")) {
         Clock c;
         c.name = r.Text("name", true);
-        c.period = r.Number("period");
+        c.period = r.Time("period");
         c.net = r.Text("net");
         c.properties = r.Props();
         design->clocks.push_back(std::move(c));
@@ -178,7 +201,8 @@ std::unique_ptr<Design> Build(const ordered_json& root) {
         IoPort p;
         p.name = r.Text("name", true);
         const std::string direction = r.Text("direction", true);
-        if (direction != "in" && direction != "out") throw BadField{r.Path("direction") + " must be in or out"};
+        if (direction != "in" && direction != "out")
+            throw BadField{r.Path("direction") + " must be in or out, not " + Shown(direction)};
         p.output = direction == "out";
         p.site = r.Text("site");
         p.standard = r.Text("standard");
@@ -190,8 +214,8 @@ std::unique_ptr<Design> Build(const ordered_json& root) {
         c.name = r.Text("name", true);
         c.type = r.Text("type", true);
         c.site = r.Text("site");
-        c.delay = r.Number("delay");
-        c.setup = r.Number("setup");
+        c.delay = r.Time("delay");
+        c.setup = r.Time("setup");
         c.sequential = r.Flag("sequential", c.type == "FF");
         c.clock = r.Text("clock");
         c.properties = r.Props();
@@ -202,7 +226,7 @@ std::unique_ptr<Design> Build(const ordered_json& root) {
         n.name = r.Text("name", true);
         n.driver = r.Text("driver", true);
         n.loads = r.Words("loads");
-        n.delay = r.Number("delay");
+        n.delay = r.Time("delay");
         n.properties = r.Props();
         design->nets.push_back(std::move(n));
     }
@@ -231,6 +255,132 @@ ordered_json PropsJson(const Properties& p) {
     return out;
 }
 
+// Follows a parse of JSON text to name the field where it fails: the path of the value being read
+// when the parser gave up. Only run once a parse has failed, so it keeps no values.
+class WhereItFails final : public nlohmann::json_sax<ordered_json> {
+public:
+    std::string path;
+    std::string token;  // the text the parser stopped at
+    int id = 0;         // nlohmann's number of the failure
+
+    bool null() override { return Value(); }
+    bool boolean(bool) override { return Value(); }
+    bool number_integer(number_integer_t) override { return Value(); }
+    bool number_unsigned(number_unsigned_t) override { return Value(); }
+    bool number_float(number_float_t, const string_t&) override { return Value(); }
+    bool string(string_t&) override { return Value(); }
+    bool binary(binary_t&) override { return Value(); }
+    bool start_object(std::size_t) override { return Open(false); }
+    bool key(string_t& name) override {
+        m_levels.back().key = name;
+        return true;
+    }
+    bool end_object() override { return Close(); }
+    bool start_array(std::size_t) override { return Open(true); }
+    bool end_array() override { return Close(); }
+    bool parse_error(std::size_t, const std::string& last, const nlohmann::json::exception& failure) override {
+        token = last;
+        id = failure.id;
+        for (const Level& level : m_levels) {
+            if (level.array)
+                path += "[" + std::to_string(level.index) + "]";
+            else if (!level.key.empty())
+                path += (path.empty() ? "" : ".") + level.key;
+        }
+        return false;
+    }
+
+private:
+    struct Level {
+        bool array = false;
+        std::size_t index = 0;  // of the element being read, in an array
+        std::string key;        // of the member being read, in an object
+    };
+    bool Open(bool array) {
+        m_levels.push_back(Level{array, 0, {}});
+        return true;
+    }
+    bool Close() {
+        m_levels.pop_back();
+        return Value();
+    }
+    bool Value() {
+        if (!m_levels.empty() && m_levels.back().array) ++m_levels.back().index;
+        return true;
+    }
+    std::vector<Level> m_levels;
+};
+
+// The length of the valid UTF-8 sequence that starts at `text[at]`, or 0: no overlong forms, no
+// surrogates (Tcl's encoding of a NUL and of a lone surrogate are both refused), nothing beyond
+// U+10FFFF.
+std::size_t Utf8Length(std::string_view text, std::size_t at) {
+    const auto byte = [&](std::size_t i) { return static_cast<unsigned char>(text[i]); };
+    const unsigned char lead = byte(at);
+    if (lead < 0x80) return 1;
+    std::size_t length = 0;
+    std::uint32_t code = 0;
+    if (lead >= 0xC2 && lead <= 0xDF)
+        length = 2, code = lead & 0x1Fu;
+    else if ((lead & 0xF0) == 0xE0)
+        length = 3, code = lead & 0x0Fu;
+    else if (lead >= 0xF0 && lead <= 0xF4)
+        length = 4, code = lead & 0x07u;
+    else
+        return 0;
+    if (at + length > text.size()) return 0;
+    for (std::size_t i = 1; i < length; ++i) {
+        if ((byte(at + i) & 0xC0) != 0x80) return 0;
+        code = code << 6 | (byte(at + i) & 0x3Fu);
+    }
+    if (length == 3 && (code < 0x800 || (code >= 0xD800 && code <= 0xDFFF))) return 0;
+    if (length == 4 && (code < 0x10000 || code > 0x10FFFF)) return 0;
+    return length;
+}
+
+// Whether the text can go into a JSON file; else `shown` is the text with its bad bytes as \xHH.
+bool WritableText(std::string_view text, std::string& shown) {
+    bool writable = true;
+    shown.clear();
+    for (std::size_t at = 0; at < text.size();) {
+        const std::size_t length = Utf8Length(text, at);
+        if (length == 0) {
+            char escaped[5];
+            std::snprintf(escaped, sizeof escaped, "\\x%02X", static_cast<unsigned char>(text[at]));
+            shown += escaped;
+            writable = false;
+            ++at;
+        } else {
+            shown.append(text, at, length);
+            at += length;
+        }
+    }
+    return writable;
+}
+
+// The first name or text of `node` that cannot be written, by its path; empty when all can.
+std::string Unwritable(const ordered_json& node, const std::string& path) {
+    std::string shown;
+    if (node.is_string()) {
+        if (WritableText(node.get_ref<const std::string&>(), shown)) return {};
+        return (path.empty() ? std::string("the design") : path) + " is no valid UTF-8 text (a NUL or a lone surrogate " +
+               "cannot be written): \"" + shown + "\"";
+    }
+    if (node.is_array()) {
+        for (std::size_t i = 0; i < node.size(); ++i)
+            if (std::string bad = Unwritable(node[i], path + "[" + std::to_string(i) + "]"); !bad.empty()) return bad;
+    } else if (node.is_object()) {
+        for (const auto& [key, value] : node.items()) {
+            const std::string inner = path.empty() ? key : path + "." + key;
+            if (!WritableText(key, shown))
+                return (path.empty() ? std::string("the design") : path) +
+                       " has a name that is no valid UTF-8 text: \"" + shown + "\"";
+            if (std::string bad = Unwritable(value, inner); !bad.empty()) return bad;
+        }
+    }
+    return {};
+}
+
 }  // namespace
 
 std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error) {
@@ -240,32 +390,39 @@ std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error)
     } catch (const nlohmann::json::parse_error& e) {
         error = std::string("it is not valid JSON (") + e.what() + ")";
         return nullptr;
+    } catch (const nlohmann::json::exception& e) {
+        // Beyond syntax the parser refuses only a number too large for a double: read again to
+        // name its field.
+        WhereItFails where;
+        ordered_json::sax_parse(text, &where);
+        if (where.id != e.id) error = e.what();
+        else error = (where.path.empty() ? std::string("the design") : where.path) + " holds the number " + where.token +
+                ", which is too large";
+        return nullptr;
     }
     try {
         return Build(root);
     } catch (const BadField& bad) {
         error = bad.text;
-    } catch (const nlohmann::json::exception& e) {
+    } catch (const std::exception& e) {
         error = e.what();
     }
     return nullptr;
 }
 
 std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error) {
-    std::ifstream in(file, std::ios::binary);
-    if (!in) {
-        error = "cannot read the project file '" + file + "': no such readable file";
+    std::string text, why;
+    if (!ReadTextFile(file, text, why)) {
+        error = "cannot read the project file '" + file + "': " + why;
         return nullptr;
     }
-    std::ostringstream text;
-    text << in.rdbuf();
     std::string problem;
-    auto design = ParseDesign(text.str(), problem);
+    auto design = ParseDesign(text, problem);
     if (!design) error = "the project file '" + file + "' is malformed: " + problem;
     return design;
 }
 
-std::string FormatDesign(const Design& d) {
+bool FormatDesign(const Design& d, std::string& text, std::string& error) {
     ordered_json root = ordered_json::object();
     root["design"] = d.name;
     ordered_json device = ordered_json::object();
@@ -317,23 +474,21 @@ std::string FormatDesign(const Design& d) {
         root["floorplan"] = std::move(plan);
     }
     if (!d.properties.empty()) root["properties"] = PropsJson(d.properties);
-    return root.dump(2) + "\n";
+    // Checked before the dump, which would throw on the first bad byte without saying where.
+    if (error = Unwritable(root, ""); !error.empty()) return false;
+    try {
+        text = root.dump(2) + "\n";
+    } catch (const std::exception& e) {
+        error = e.what();
+        return false;
+    }
+    return true;
 }
 
 bool WriteDesign(const Design& design, const std::string& file, std::string& error) {
-    // Written beside the file first, so that a failed write leaves the old file whole.
-    const std::string temporary = file + ".tmp";
-    {
-        std::ofstream out(temporary, std::ios::binary | std::ios::trunc);
-        if (!out || !(out << FormatDesign(design)) || !out.flush()) {
-            error = "cannot write the project file '" + file + "'";
-            std::remove(temporary.c_str());
-            return false;
-        }
-    }
-    if (std::rename(temporary.c_str(), file.c_str()) != 0) {
-        error = "cannot replace the project file '" + file + "'";
-        std::remove(temporary.c_str());
+    std::string text, why;
+    if (!FormatDesign(design, text, why) || !WriteTextFile(file, text, why)) {
+        error = "cannot write the project file '" + file + "': " + why;
         return false;
     }
     return true;

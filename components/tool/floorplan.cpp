@@ -20,14 +20,13 @@
 //                              region of a block, zoom fit ANYTHING the whole device.
 #include <algorithm>
 #include <cstdlib>
-#include <fstream>
 #include <memory>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include "TcltaskI/IXFloorplan.h"
 #include "component.h"
+#include "file_io.h"
 #include "floorplan_model.h"
 #include "floorplan_values.h"
 #include "project.h"
@@ -45,6 +44,9 @@ constexpr const char* kNameKey = "floorplan_name";
 constexpr const char* kClockLimitKey = "clock_limit";
 
 const std::vector<std::string> kWritable{"name", "site_capacity", "sso_limit", "clock_limit"};
+// Sites prohibit may name in all: each is a name kept and answered, and a range of a large device
+// would otherwise ask for billions of them.
+constexpr long long kMaxProhibited = 1000000;
 std::string Quote(const std::string& name) { return "'" + name + "'"; }
 
 bool WholeNumber(const std::string& text, long long low, long long high, int& out) {
@@ -66,15 +68,6 @@ std::vector<std::string> Words(const std::string& text) {
     return words;
 }
 
-bool ReadFile(const std::string& file, std::string& text) {
-    std::ifstream in(file, std::ios::binary);
-    if (!in) return false;
-    std::ostringstream buffer;
-    buffer << in.rdbuf();
-    text = buffer.str();
-    return !in.bad();
-}
-
 std::optional<ConstraintForm> FormFromWord(const std::string& word) {
     for (ConstraintForm f : {ConstraintForm::Ucf, ConstraintForm::Csv, ConstraintForm::Vhdl, ConstraintForm::Vlog})
         if (word == FormWord(f)) return f;
@@ -83,9 +76,9 @@ std::optional<ConstraintForm> FormFromWord(const std::string& word) {
 
 // Reads and parses one constraint file.
 bool Load(ConstraintForm form, const std::string& file, FloorplanConstraints& out, std::string& error) {
-    std::string text;
-    if (!ReadFile(file, text)) {
-        error = std::string("cannot read the ") + FormWord(form) + " file '" + file + "'";
+    std::string text, why;
+    if (!ReadTextFile(file, text, why)) {
+        error = std::string("cannot read the ") + FormWord(form) + " file '" + file + "': " + why;
         return false;
     }
     if (!ParseConstraints(form, text, out, error)) {
@@ -132,24 +125,25 @@ public:
             int columns = 0, rows = 0, banks = 0, sso = 0, capacity = 0, clocks = 0;
             if (name.empty()) return Fail(message, "the floorplan needs a name");
             if (device.empty()) return Fail(message, "the device needs a name");
-            if (!WholeNumber(s3.c_str(), 1, 100000, columns))
+            if (!WholeNumber(s3.c_str(), 1, kMaxSide, columns))
                 return Fail(message,
                             "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
-            if (!WholeNumber(s4.c_str(), 1, 100000, rows))
+            if (!WholeNumber(s4.c_str(), 1, kMaxSide, rows))
                 return Fail(message, "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
             if (layout != "columns" && layout != "rows")
                 return Fail(message, "unknown bank layout '" + layout + "': use columns or rows");
             const int stripes = layout == "columns" ? columns : rows;
-            if (!WholeNumber(s5.c_str(), 1, stripes, banks))
-                return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(stripes) +
-                                         ", not '" + std::string(s5.c_str()) + "'");
-            if (!WholeNumber(s7.c_str(), 0, 1000000, sso))
+            const int most = std::min(stripes, kMaxBanks);
+            if (!WholeNumber(s5.c_str(), 1, most, banks))
+                return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(most) + ", not '" +
+                                         std::string(s5.c_str()) + "'");
+            if (!WholeNumber(s7.c_str(), 0, kMaxCount, sso))
                 return Fail(message, "the sso limit must be a whole number of at least 0, not '" +
                                          std::string(s7.c_str()) + "'");
-            if (!WholeNumber(s8.c_str(), 1, 1000000, capacity))
+            if (!WholeNumber(s8.c_str(), 1, kMaxCount, capacity))
                 return Fail(message,
                             "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
-            if (!WholeNumber(s9.c_str(), 0, 1000000, clocks))
+            if (!WholeNumber(s9.c_str(), 0, kMaxCount, clocks))
                 return Fail(message, "the clock limit must be a whole number of at least 0, not '" +
                                          std::string(s9.c_str()) + "'");
             Device d;
@@ -236,16 +230,22 @@ public:
     RESULT export_(const Str& ucf, const Str& csv, const Str& vhdl, const Str& vlog, Out& result,
                    Msg& message) override {
         return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
-            std::vector<std::string> written;
-            for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
-                std::ofstream out(file, std::ios::binary | std::ios::trunc);
-                out << FormatConstraints(form, plan.constraints, state.CurrentDesign()->name);
-                out.close();
-                if (!out)
-                    return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "'");
-                written.push_back(file);
+            // Every text is made and checked before any file is written; each file is then
+            // replaced whole or not at all.
+            const auto files = Files(ucf, csv, vhdl, vlog);
+            if (files.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
+            std::vector<std::string> texts(files.size()), written;
+            std::string why;
+            auto failed = [&](ConstraintForm form, const std::string& file) {
+                return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
+            };
+            for (std::size_t i = 0; i < files.size(); ++i)
+                if (!FormatConstraints(files[i].first, plan.constraints, state.CurrentDesign()->name, texts[i], why))
+                    return failed(files[i].first, files[i].second);
+            for (std::size_t i = 0; i < files.size(); ++i) {
+                if (!WriteTextFile(files[i].second, texts[i], why)) return failed(files[i].first, files[i].second);
+                written.push_back(files[i].second);
             }
-            if (written.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
             return Answer(NewList(written), result, message);
         });
     }
@@ -332,14 +332,14 @@ public:
                 if (text.empty()) return Fail(message, "the floorplan needs a name");
                 changed.name = text;
             } else if (key == "site_capacity") {
-                if (!WholeNumber(text, 1, 1000000, number))
+                if (!WholeNumber(text, 1, kMaxCount, number))
                     return Fail(message, "the site capacity must be a whole number from 1, not '" + text + "'");
                 changed.device.siteCapacity = number;
             } else if (key == "clock_limit") {
-                if (!WholeNumber(text, 0, 1000000, number))
+                if (!WholeNumber(text, 0, kMaxCount, number))
                     return Fail(message, "the clock limit must be a whole number of at least 0, not '" + text + "'");
                 changed.clockLimit = number;
-            } else if (WholeNumber(text, 0, 1000000, number)) {
+            } else if (WholeNumber(text, 0, kMaxCount, number)) {
                 for (Bank& b : changed.device.banks) b.ssoLimit = number;
             } else {
                 // A dict of bank and limit sets the named banks only.
@@ -352,7 +352,7 @@ public:
                                              [&](const Bank& b) { return b.name == words[i]; });
                     if (bank == changed.device.banks.end())
                         return Fail(message, Quote(words[i]) + " is no bank of the device");
-                    if (!WholeNumber(words[i + 1], 0, 1000000, bank->ssoLimit))
+                    if (!WholeNumber(words[i + 1], 0, kMaxCount, bank->ssoLimit))
                         return Fail(message, "the sso limit of " + Quote(words[i]) +
                                                  " must be a whole number of at least 0, not '" + words[i + 1] + "'");
                 }
@@ -411,7 +411,7 @@ public:
                     SetRegion(b, r);
                 } else {
                     b.constraints[key] =
-                        key == "capacity" ? std::to_string(std::strtoll(text.c_str(), nullptr, 10)) : text;
+                        key == "capacity" ? std::to_string(*ParseCapacity(text)) : text;
                 }
             }
             return AnswerBlocks(plan, std::move(changed), names, result, message);
@@ -459,8 +459,8 @@ public:
             if (from.empty() || from.size() != to.size())
                 return Fail(message, "the two port lists must be of the same length, and not empty");
             int dx = 0, dy = 0;
-            if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -100000, 100000, dx) ||
-                                    !WholeNumber(offset[1], -100000, 100000, dy)))
+            if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -kMaxSide, kMaxSide, dx) ||
+                                    !WholeNumber(offset[1], -kMaxSide, kMaxSide, dy)))
                 return Fail(message,
                             "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
             if (mode == "swap" && (dx != 0 || dy != 0))
@@ -615,7 +615,7 @@ private:
         for (const IoPort& p : design->ports)
             if (!p.site.empty()) fresh.constraints.ports[p.name] = p.site;
         if (auto limit = design->properties.find(kClockLimitKey); limit != design->properties.end())
-            WholeNumber(limit->second, 0, 1000000, fresh.clockLimit);
+            WholeNumber(limit->second, 0, kMaxCount, fresh.clockLimit);
         fresh.view = WholeDevice(fresh.device);
         return true;
     }
@@ -626,19 +626,19 @@ private:
         return 1;
     }
 
-    // Puts the working copy into the design and writes the project file; on any failure the design
-    // is as it was.
+    // Writes the design with the working copy in it to the project file, and then makes it the
+    // project's design; on any failure the file, the design and the floorplan are as they were.
     static bool Commit(ToolState& state, std::string& file, Msg& message) {
         FloorplanData* plan = Ready(state, message);
         if (!plan) return false;
         ProjectComponent* project = state.Current();
-        Design& design = *project->GetDesign();
         for (const Block& b : plan->constraints.blocks)
             if (auto r = RegionOf(b);
                 r && !(plan->device.OnDevice(r->x0, r->y0) && plan->device.OnDevice(r->x1, r->y1)))
                 return Fail(message, "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
                                          RegionText(*r) + ", which reaches beyond the device") != 0;
-        Design before = design;
+        const Design& before = *project->GetDesign();
+        Design design = before;
         design.device = plan->device;
         design.blocks = plan->constraints.blocks;
         design.prohibited = plan->constraints.prohibited;
@@ -659,13 +659,8 @@ private:
         else
             design.properties.erase(kClockLimitKey);
         std::string problem = design.Index();
-        Port_String written;
-        if (problem.empty() && project->Sync(written) != 1) problem = written.c_str();
-        if (!problem.empty()) {
-            design = std::move(before);
-            design.Index();
-            return Fail(message, "the floorplan cannot be saved: " + problem) != 0;
-        }
+        if (problem.empty()) project->Store(std::move(design), problem);
+        if (!problem.empty()) return Fail(message, "the floorplan cannot be saved: " + problem) != 0;
         file = project->File();
         if (moved) state.DesignChanged();
         plan->epoch = state.designEpoch;
@@ -749,13 +744,23 @@ private:
                 if (!plan.device.OnDevice(r.x0, r.y0) || !plan.device.OnDevice(r.x1, r.y1))
                     return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan.device.columns) +
                                              " x " + std::to_string(plan.device.rows) + " sites)");
+                if (!prohibit) {
+                    // A walk over what is prohibited, not over the range, which may be huge.
+                    std::erase_if(changed, [&r](const std::string& site) {
+                        int sx = 0, sy = 0;
+                        return ParseSiteName(site, sx, sy) && r.Contains(sx, sy);
+                    });
+                    continue;
+                }
+                if (r.Sites() > kMaxProhibited)
+                    return Fail(message, Quote(w) + " covers " + std::to_string(r.Sites()) +
+                                             " sites; a floorplan prohibits at most " +
+                                             std::to_string(kMaxProhibited) + " sites");
                 for (int yy = r.y0; yy <= r.y1; ++yy)
-                    for (int xx = r.x0; xx <= r.x1; ++xx) {
-                        if (prohibit)
-                            changed.insert(Device::SiteName(xx, yy));
-                        else
-                            changed.erase(Device::SiteName(xx, yy));
-                    }
+                    for (int xx = r.x0; xx <= r.x1; ++xx) changed.insert(Device::SiteName(xx, yy));
+                if (static_cast<long long>(changed.size()) > kMaxProhibited)
+                    return Fail(message, "the floorplan would prohibit " + std::to_string(changed.size()) +
+                                             " sites, more than " + std::to_string(kMaxProhibited));
             }
             if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
             plan.constraints.prohibited = std::move(changed);

@@ -2,7 +2,7 @@
 // clock nets per region. Each looks at the floorplan's working copy on its own device, with the
 // cells where the design places them.
 #include <algorithm>
-#include <cstdlib>
+#include <charconv>
 #include <map>
 #include <set>
 #include <string>
@@ -21,6 +21,13 @@ bool Inside(const Device& device, const Region& r) {
 
 }  // namespace
 
+std::optional<long long> ParseCapacity(const std::string& value) {
+    long long n = 0;
+    const auto [end, ec] = std::from_chars(value.data(), value.data() + value.size(), n);
+    if (ec != std::errc() || end != value.data() + value.size() || n < 0) return std::nullopt;
+    return n;
+}
+
 std::string CheckBlockConstraint(const std::string& name, const std::string& value) {
     if (name == "region") {
         Region r;
@@ -28,10 +35,7 @@ std::string CheckBlockConstraint(const std::string& name, const std::string& val
         return ParseRegion(value, r, error) ? std::string() : error;
     }
     if (name == "capacity") {
-        char* end = nullptr;
-        const long long n = std::strtoll(value.c_str(), &end, 10);
-        if (value.empty() || *end != '\0' || n < 0)
-            return "a capacity must be a whole number of at least 0, not '" + value + "'";
+        if (!ParseCapacity(value)) return "a capacity must be a whole number of at least 0, not '" + value + "'";
         return {};
     }
     if (name == "comment") return {};
@@ -66,13 +70,19 @@ std::string CheckConstraints(const Design& design, const Device& device, const F
 
 std::optional<long long> CapacityOf(const Block& block, const FloorplanData& plan) {
     if (auto it = block.constraints.find("capacity"); it != block.constraints.end())
-        return std::strtoll(it->second.c_str(), nullptr, 10);
+        return ParseCapacity(it->second).value_or(0);
     const auto region = RegionOf(block);
     if (!region) return std::nullopt;
-    long long free = 0;
-    for (int y = std::max(region->y0, 0); y <= std::min(region->y1, plan.device.rows - 1); ++y)
-        for (int x = std::max(region->x0, 0); x <= std::min(region->x1, plan.device.columns - 1); ++x)
-            if (!plan.constraints.prohibited.count(Device::SiteName(x, y))) ++free;
+    // The sites of the region on the device less the prohibited ones among them: a walk over the
+    // prohibited sites, not over the region, which may hold billions of sites.
+    const Region on{std::max(region->x0, 0), std::max(region->y0, 0), std::min(region->x1, plan.device.columns - 1),
+                    std::min(region->y1, plan.device.rows - 1)};
+    if (on.x0 > on.x1 || on.y0 > on.y1) return 0;
+    long long free = on.Sites();
+    for (const std::string& site : plan.constraints.prohibited) {
+        int x = 0, y = 0;
+        if (ParseSiteName(site, x, y) && on.Contains(x, y)) --free;
+    }
     return free * plan.device.siteCapacity;
 }
 

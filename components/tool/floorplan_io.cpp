@@ -476,20 +476,81 @@ std::string_view StripComment(std::string_view line, std::string_view marker) {
     return line;
 }
 
-}  // namespace
+// The design's name as the first comment line shows it: on one line, whatever it holds.
+std::string OneLine(std::string text) {
+    std::replace_if(text.begin(), text.end(), [](char c) { return c == '\n' || c == '\r'; }, ' ');
+    return text;
+}
 
-std::string FormatConstraints(ConstraintForm form, const FloorplanConstraints& c, const std::string& design) {
+std::string Format(ConstraintForm form, const FloorplanConstraints& c, const std::string& design) {
     switch (form) {
         case ConstraintForm::Ucf:
-            return FormatUcf(Entries(c), design);
+            return FormatUcf(Entries(c), OneLine(design));
         case ConstraintForm::Csv:
             return FormatCsv(Entries(c));
         case ConstraintForm::Vhdl:
-            return FormatVhdl(Entries(c), design);
+            return FormatVhdl(Entries(c), OneLine(design));
         case ConstraintForm::Vlog:
-            return FormatVlog(c, design);
+            return FormatVlog(c, OneLine(design));
     }
     return {};
+}
+
+bool HoldsExactly(ConstraintForm form, const FloorplanConstraints& c) {
+    FloorplanConstraints back;
+    std::string ignored;
+    return ParseConstraints(form, Format(form, c, ""), back, ignored) && back == c;
+}
+
+// The first item of `c` that the form cannot hold, tried one at a time.
+std::string FirstUnheld(ConstraintForm form, const FloorplanConstraints& c) {
+    const auto quote = [](const std::string& name) { return "'" + name + "'"; };
+    for (const Block& b : c.blocks) {
+        const auto holds = [form](const Block& block) {
+            FloorplanConstraints one;
+            one.blocks.push_back(block);
+            return HoldsExactly(form, one);
+        };
+        Block part;
+        part.name = b.name;
+        if (!holds(part)) return "the name of block " + quote(b.name);
+        part.cells = b.cells;
+        if (!holds(part)) return "the cells of block " + quote(b.name);
+        part.cells.clear();
+        SetRegion(part, RegionOf(b));
+        if (!holds(part)) return "the region of block " + quote(b.name);
+        SetRegion(part, std::nullopt);
+        for (const auto& [key, value] : b.constraints) {
+            part.constraints = {{key, value}};
+            if (!holds(part)) return "the " + key + " of block " + quote(b.name);
+        }
+    }
+    for (const std::string& site : c.prohibited) {
+        FloorplanConstraints one;
+        one.prohibited.insert(site);
+        if (!HoldsExactly(form, one)) return "the prohibited site " + quote(site);
+    }
+    for (const auto& [port, site] : c.ports) {
+        FloorplanConstraints one;
+        one.ports[port] = site;
+        if (!HoldsExactly(form, one)) return "port " + quote(port) + " on " + quote(site);
+    }
+    return "these constraints";
+}
+
+}  // namespace
+
+bool FormatConstraints(ConstraintForm form, const FloorplanConstraints& c, const std::string& design,
+                       std::string& text, std::string& error) {
+    std::string formatted = Format(form, c, design);
+    FloorplanConstraints back;
+    std::string ignored;
+    if (!ParseConstraints(form, formatted, back, ignored) || !(back == c)) {
+        error = std::string("the ") + FormWord(form) + " form cannot hold " + FirstUnheld(form, c);
+        return false;
+    }
+    text = std::move(formatted);
+    return true;
 }
 
 bool ParseConstraints(ConstraintForm form, const std::string& text, FloorplanConstraints& out, std::string& error) {

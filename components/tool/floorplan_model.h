@@ -22,7 +22,11 @@ struct Region {
 
     bool Contains(int x, int y) const noexcept { return x >= x0 && x <= x1 && y >= y0 && y <= y1; }
     bool Overlaps(const Region& o) const noexcept { return x0 <= o.x1 && o.x0 <= x1 && y0 <= o.y1 && o.y0 <= y1; }
-    long long Sites() const noexcept { return static_cast<long long>(x1 - x0 + 1) * (y1 - y0 + 1); }
+    // In 64 bits: a region of a large device, or one given by four numbers, has more sites than an
+    // int holds.
+    long long Sites() const noexcept {
+        return (static_cast<long long>(x1) - x0 + 1) * (static_cast<long long>(y1) - y0 + 1);
+    }
 };
 
 // A region is written "X0Y0:X3Y3" (the corner sites) or as four numbers "x0 y0 x1 y1"; either way
@@ -39,6 +43,7 @@ struct FloorplanConstraints {
     std::vector<Block> blocks;
     std::set<std::string> prohibited;          // site names
     std::map<std::string, std::string> ports;  // port -> site
+    friend bool operator==(const FloorplanConstraints&, const FloorplanConstraints&) = default;
 };
 
 struct FloorplanData {
@@ -59,7 +64,11 @@ void MergeConstraints(FloorplanConstraints& base, const FloorplanConstraints& ex
 // The four constraint file forms (floorplan_io.cpp documents each).
 enum class ConstraintForm { Ucf, Csv, Vhdl, Vlog };
 const char* FormWord(ConstraintForm form) noexcept;
-std::string FormatConstraints(ConstraintForm form, const FloorplanConstraints& constraints, const std::string& design);
+// The text of the constraints in one form, when the form holds them exactly: read back, the text
+// gives the same constraints. False otherwise, with `error` naming the first item the form cannot
+// hold (a line break in a value, a port name that is no word of vhdl, ...).
+bool FormatConstraints(ConstraintForm form, const FloorplanConstraints& constraints, const std::string& design,
+                       std::string& text, std::string& error);
 // Reads the text of one form; the error names the line. Only the syntax is checked here.
 bool ParseConstraints(ConstraintForm form, const std::string& text, FloorplanConstraints& out, std::string& error);
 
@@ -68,6 +77,8 @@ bool ParseConstraints(ConstraintForm form, const std::string& text, FloorplanCon
 // Whether the constraints fit the design on `device`: known cells and ports, each cell in one block
 // at most, known block constraints with proper values, sites on the device. Empty when they do.
 std::string CheckConstraints(const Design& design, const Device& device, const FloorplanConstraints& constraints);
+// A capacity constraint's value: a whole number from 0 that a long long holds, or nothing.
+std::optional<long long> ParseCapacity(const std::string& value);
 // Checks the value of a block constraint (region, capacity, comment); empty when it is proper.
 std::string CheckBlockConstraint(const std::string& name, const std::string& value);
 struct DrcFinding {

@@ -28,8 +28,7 @@ inline bool ResolveItems(const ToolState& state, const UtilI::TclPropertyList& i
 
 // The limit of a settings table's max_items; 0 is none.
 inline std::size_t MaxItems(const SettingTable& table) {
-    const Setting* s = table.Find("max_items");
-    return s ? static_cast<std::size_t>(std::max(0LL, std::stoll(s->value))) : 0;
+    return static_cast<std::size_t>(std::max(0LL, table.Integer("max_items", 0)));
 }
 
 }  // namespace kelmartool

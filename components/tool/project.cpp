@@ -89,6 +89,16 @@ CommonI::RESULT ProjectComponent::Sync(Port_String& message) {
     return 1;
 }
 
+bool ProjectComponent::Store(Design design, std::string& error) {
+    if (!IsOpen()) {
+        error = kNoProject;
+        return false;
+    }
+    if (!WriteDesign(design, m_file, error)) return false;
+    *m_design = std::move(design);
+    return true;
+}
+
 CommonI::RESULT ProjectComponent::Reload(Port_String& message) {
     if (!IsOpen()) return Fail(message, kNoProject);
     std::string error;

@@ -36,6 +36,9 @@ public:
     Design* GetDesign() const noexcept { return m_design.get(); }
     const std::string& File() const noexcept { return m_file; }
     const std::string& HelperName() const noexcept { return m_helperName; }
+    // Writes `design` to the project file and makes it the project's design; on failure neither
+    // the file nor the design in memory changes, and `error` says why.
+    bool Store(Design design, std::string& error);
     // Drops the design and the registered components; the project leaves the open list.
     void Drop();
 

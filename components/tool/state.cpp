@@ -1,5 +1,7 @@
 // The tool state of one interpreter: its settings and the parts that refer to the current design.
 #include <algorithm>
+#include <cstdint>
+#include <limits>
 
 #include "design.h"
 #include "project.h"
@@ -8,18 +10,27 @@
 namespace kelmartool {
 
 ToolState::ToolState(Tcl_Interp* owner) : interp(owner) {
-    settings.Define("search_limit", SettingType::Int, "0", "most hits a search gives; 0 gives all");
-    settings.Define("zoom_factor", SettingType::Double, "2", "how much zoom -in and -out magnify or shrink the view");
-    settings.Define("pan_percentage", SettingType::Int, "50", "how far pan moves, in percent of the view, when not given");
-    settings.Define("max_paths", SettingType::Int, "5", "worst paths a timing analysis reports");
+    // The bounds are what the commands reading the settings work with: counts that an int holds,
+    // the percentages pan -percentage takes, a zoom that changes the view by at most a thousand.
+    constexpr double kMostCount = std::numeric_limits<int32_t>::max();
+    settings.Define("search_limit", SettingType::Int, "0", "most hits a search gives; 0 gives all",
+                    Setting::Bounds{0, kMostCount});
+    settings.Define("zoom_factor", SettingType::Double, "2", "how much zoom -in and -out magnify or shrink the view",
+                    Setting::Bounds{1, 1000});
+    settings.Define("pan_percentage", SettingType::Int, "50", "how far pan moves, in percent of the view, when not given",
+                    Setting::Bounds{1, 1000});
+    settings.Define("max_paths", SettingType::Int, "5", "worst paths a timing analysis reports",
+                    Setting::Bounds{0, kMostCount});
 
     highlightSettings.Define("default_highlight_color", SettingType::Color, "yellow",
                              "colour of highlight add when no -color is given");
-    highlightSettings.Define("max_items", SettingType::Int, "0", "most objects highlighted at once; 0 is no limit");
+    highlightSettings.Define("max_items", SettingType::Int, "0", "most objects highlighted at once; 0 is no limit",
+                             Setting::Bounds{0, kMostCount});
 
     selectionSettings.Define("filter", SettingType::Choice, "all", "the only kind of object that can be selected",
                              {"all", "cell", "net", "port", "clock", "bank", "site"});
-    selectionSettings.Define("max_items", SettingType::Int, "0", "most objects selected at once; 0 is no limit");
+    selectionSettings.Define("max_items", SettingType::Int, "0", "most objects selected at once; 0 is no limit",
+                             Setting::Bounds{0, kMostCount});
 }
 
 ToolState::~ToolState() = default;

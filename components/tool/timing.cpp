@@ -20,7 +20,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
-#include <fstream>
 #include <memory>
 #include <sstream>
 #include <string>
@@ -28,6 +27,7 @@
 
 #include "TcltaskI/ITimingAnalysis.h"
 #include "component.h"
+#include "file_io.h"
 #include "property.h"
 #include "weak_state.h"
 #include "timing_model.h"
@@ -274,8 +274,7 @@ public:
             if (a.result && !overwrite)
                 return Fail(message, "timing analysis '" + a.id +
                                          "' has a result already: run it with -overwrite to replace the result");
-            int pathLimit = 0;
-            if (const Setting* s = state.settings.Find("max_paths")) pathLimit = std::atoi(s->value.c_str());
+            const int pathLimit = static_cast<int>(state.settings.Integer("max_paths", 0));
             TimingResult fresh;
             std::string error;
             if (!RunTiming(*design, a.settings, pathLimit, fresh, error))
@@ -480,11 +479,15 @@ private:
         const Design* design = state.CurrentDesign();
         double number = 0;
         const bool numeric = IsNumber(value, number);
+        // Times beyond kMaxTime would let the sums of a run overflow to infinity.
+        const std::string tooLarge = "the constraint " + name + " must be at most " +
+                                     std::to_string(static_cast<long long>(kMaxTime)) + " ns, not '" + value + "'";
         if (type == "period") {
             if (!design) return kNoProject;
             if (!hasObject || !design->FindClock(object))
                 return "the constraint period:CLOCK needs a clock of the design";
             if (!numeric || number <= 0) return "a clock period must be a positive number, not '" + value + "'";
+            if (number > kMaxTime) return tooLarge;
             return {};
         }
         if (type == "input_delay" || type == "output_delay") {
@@ -497,10 +500,12 @@ private:
                            " port of the design, not '" + object + "'";
             }
             if (!numeric || number < 0) return "a delay must be a number of at least 0, not '" + value + "'";
+            if (number > kMaxTime) return tooLarge;
             return {};
         }
         if (type == "uncertainty" && !hasObject) {
             if (!numeric || number < 0) return "the uncertainty must be a number of at least 0, not '" + value + "'";
+            if (number > kMaxTime) return tooLarge;
             return {};
         }
         if (type == "reference_clock" && !hasObject) {
@@ -582,10 +587,8 @@ private:
                 text << "\nHigh fanout nets:\n";
                 for (const FanoutNet& n : r.highFanout) text << "  " << n.net << " " << n.fanout << "\n";
             }
-            std::ofstream out(path, std::ios::binary | std::ios::trunc);
-            out << text.str();
-            out.close();
-            if (!out) return Fail(message, "cannot write the timing report to '" + path + "'");
+            if (std::string why; !WriteTextFile(path, text.str(), why))
+                return Fail(message, "cannot write the timing report to '" + path + "': " + why);
             return Answer(NewText(path), result, message);
         });
     }

@@ -4,6 +4,7 @@
 #include <tcl.h>
 
 #include <cstring>
+#include <exception>
 #include <string>
 
 #include "CitI/IScriptHandle.h"
@@ -62,13 +63,19 @@ int OpenCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[])
         Tcl_WrongNumArgs(interp, 1, objv, "file");
         return TCL_ERROR;
     }
-    kelmartool::StatePtr state = kelmartool::StateOf(interp);
-    CommonI::RefCountPtr<TcltaskI::ITclProjectMgr> manager(static_cast<TcltaskI::ITclProjectMgr*>(
-        kelmartool::NewProjectManager(state)->GetInterface(TcltaskI::ITclProjectMgrID)));
-    Port_String message;
-    const CommonI::RESULT ok = manager->Open(Tcl_GetString(objv[1]), message);
-    Tcl_SetObjResult(interp, Tcl_NewStringObj(message.c_str(), message.Length()));
-    return ok == 1 ? TCL_OK : TCL_ERROR;
+    // Called by Tcl directly, not through the package's frames: nothing may be thrown past here.
+    try {
+        kelmartool::StatePtr state = kelmartool::StateOf(interp);
+        CommonI::RefCountPtr<TcltaskI::ITclProjectMgr> manager(static_cast<TcltaskI::ITclProjectMgr*>(
+            kelmartool::NewProjectManager(state)->GetInterface(TcltaskI::ITclProjectMgrID)));
+        Port_String message;
+        const CommonI::RESULT ok = manager->Open(Tcl_GetString(objv[1]), message);
+        Tcl_SetObjResult(interp, Tcl_NewStringObj(message.c_str(), message.Length()));
+        return ok == 1 ? TCL_OK : TCL_ERROR;
+    } catch (const std::exception& e) {
+        Tcl_SetObjResult(interp, Tcl_ObjPrintf("cannot open the project file: %s", e.what()));
+        return TCL_ERROR;
+    }
 }
 
 // The root words and the interfaces behind them, in the order a user meets them.

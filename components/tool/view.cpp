@@ -60,20 +60,29 @@ std::optional<Box> BoxOfAll(const Design& d, const std::vector<std::string>& nam
     return box;
 }
 
-// The numbers of a property's value; false unless there are exactly `count`.
-bool Numbers(const TcltaskI::IGraphicalView::Prop& p, std::size_t count, std::vector<double>& out) {
+// A coordinate or delta a script gives lies within a billion sites of the origin: far beyond any
+// device (at most 100000 sites a side), and near enough that the view's sums, differences and
+// halves stay finite, whatever zoom -in or -out does with them afterwards.
+constexpr double kFarthest = 1e9;
+
+enum class Read { Numbers, NotNumbers, TooFar };
+
+// The numbers of a property's value: exactly `count` finite numbers, each within kFarthest.
+Read Numbers(const TcltaskI::IGraphicalView::Prop& p, std::size_t count, std::vector<double>& out) {
     TclValue value = ValueOf(p);
     int n = 0;
     Tcl_Obj** items = nullptr;
     if (!value || Tcl_ListObjGetElements(nullptr, value.get(), &n, &items) != TCL_OK || std::size_t(n) != count)
-        return false;
+        return Read::NotNumbers;
     out.clear();
     for (int i = 0; i < n; ++i) {
         double v = 0;
-        if (Tcl_GetDoubleFromObj(nullptr, items[i], &v) != TCL_OK || !std::isfinite(v)) return false;
+        if (Tcl_GetDoubleFromObj(nullptr, items[i], &v) != TCL_OK) return Read::NotNumbers;
         out.push_back(v);
     }
-    return true;
+    for (double v : out)
+        if (!(std::fabs(v) <= kFarthest)) return Read::TooFar;  // inf and NaN too
+    return Read::Numbers;
 }
 
 bool Given(const TcltaskI::IGraphicalView::Prop& p) { return p && !IsNil(TextOf(p)); }
@@ -112,19 +121,19 @@ public:
         }
         std::vector<double> n;
         if (Given(range)) {
-            if (!Numbers(range, 4, n)) return Fail(message, "-range expects four numbers {X0 Y0 X1 Y1}");
+            if (!Need(range, 4, "-range", "four numbers {X0 Y0 X1 Y1}", n, message)) return 0;
             v = FromBox(Box{std::min(n[0], n[2]), std::min(n[1], n[3]), std::max(n[0], n[2]), std::max(n[1], n[3])});
         }
         if (Given(xrange)) {
-            if (!Numbers(xrange, 2, n)) return Fail(message, "-xrange expects two numbers {X0 X1}");
+            if (!Need(xrange, 2, "-xrange", "two numbers {X0 X1}", n, message)) return 0;
             v.x = std::min(n[0], n[1]), v.width = std::fabs(n[1] - n[0]);
         }
         if (Given(yrange)) {
-            if (!Numbers(yrange, 2, n)) return Fail(message, "-yrange expects two numbers {Y0 Y1}");
+            if (!Need(yrange, 2, "-yrange", "two numbers {Y0 Y1}", n, message)) return 0;
             v.y = std::min(n[0], n[1]), v.height = std::fabs(n[1] - n[0]);
         }
         if (Given(center)) {
-            if (!Numbers(center, 2, n)) return Fail(message, "-center expects two numbers {X Y}");
+            if (!Need(center, 2, "-center", "two numbers {X Y}", n, message)) return 0;
             v.x = n[0] - v.width / 2, v.y = n[1] - v.height / 2;
         }
         const double factor = Setting("zoom_factor", 2.0);
@@ -145,7 +154,7 @@ public:
         double percent = Setting("pan_percentage", 50.0);
         if (Given(percentage)) {
             std::vector<double> p;
-            if (!Numbers(percentage, 1, p) || p[0] <= 0 || p[0] > 1000)
+            if (Numbers(percentage, 1, p) != Read::Numbers || p[0] <= 0 || p[0] > 1000)
                 return Fail(message, "-percentage expects a number above 0 and at most 1000, not '" + TextOf(percentage) + "'");
             percent = p[0];
         }
@@ -161,7 +170,7 @@ public:
         if (farright) v.x = d->device.columns - v.width;
         if (Given(delta)) {
             std::vector<double> n;
-            if (!Numbers(delta, 2, n)) return Fail(message, "-delta expects two numbers {DX DY}");
+            if (!Need(delta, 2, "-delta", "two numbers {DX DY}", n, message)) return 0;
             v.x += n[0], v.y += n[1];
         }
         if (Given(name)) {
@@ -186,10 +195,19 @@ private:
         v.x = cx - v.width / 2, v.y = cy - v.height / 2;
     }
 
-    double Setting(const char* name, double fallback) const {
-        const kelmartool::Setting* s = m_state->settings.Find(name);
-        return s ? std::strtod(s->value.c_str(), nullptr) : fallback;
+    // The numbers an option gives, or false with the failure said in `message`.
+    static bool Need(const Prop& p, std::size_t count, const char* option, const char* what, std::vector<double>& n,
+                     Msg& message) {
+        switch (Numbers(p, count, n)) {
+            case Read::Numbers: return true;
+            case Read::NotNumbers: return Fail(message, std::string(option) + " expects " + what) != 0;
+            case Read::TooFar: break;
+        }
+        return Fail(message, std::string(option) + " expects numbers from -" + std::to_string(std::lround(kFarthest)) +
+                                 " to " + std::to_string(std::lround(kFarthest)) + ", not '" + TextOf(p) + "'") != 0;
     }
+
+    double Setting(const char* name, double fallback) const { return m_state->settings.Number(name, fallback); }
 
     Viewport Shown() const {
         const ViewState& view = m_state->view;
