@@ -11,7 +11,7 @@ JOBS       ?= 2
 PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev libgtest-dev nlohmann-json3-dev
 CMAKE_ARGS ?=
 
-.PHONY: deps build test test-plain test-sanitize clean demo
+.PHONY: deps build build-sanitize test test-plain test-sanitize clean demo
 
 deps:
 	@missing=""; for p in $(PACKAGES); do \
@@ -29,9 +29,11 @@ build: deps
 test-plain: build
 	ctest --test-dir $(BUILD) --output-on-failure -j $(JOBS)
 
-test-sanitize: deps
+build-sanitize: deps
 	cmake -S . -B $(SAN_BUILD) -DKELMAR_SANITIZE=ON -DCMAKE_BUILD_TYPE=Debug $(CMAKE_ARGS)
 	cmake --build $(SAN_BUILD) -j $(JOBS)
+
+test-sanitize: build-sanitize
 	ctest --test-dir $(SAN_BUILD) --output-on-failure -j $(JOBS)
 
 test: test-plain test-sanitize
