@@ -3,6 +3,7 @@
 #   make test    build and run every test, then again under AddressSanitizer and UBSan
 #   make demo    build and run the tour of the reference tool on the sample design
 #   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
+#   make fuzz    seeded random command lines under the sanitizer build (not part of make test)
 #   make clean   remove the build folders
 
 BUILD      ?= build
@@ -55,6 +56,20 @@ bench: bench-deps
 	cmake -S . -B $(BENCH_BUILD) -DCMAKE_BUILD_TYPE=Release -DKELMAR_BENCH=ON $(CMAKE_ARGS)
 	cmake --build $(BENCH_BUILD) -j $(JOBS) --target run_bench
 	mkdir -p $(BUILD) && cp $(BENCH_BUILD)/bench.json $(BUILD)/bench.json
+
+# The fuzzer runs FUZZ_LINES lines in batches of FUZZ_BATCH, one process and seed each, from
+# FUZZ_SEED on; FUZZ_WITHOUT names classes of lines to leave out (see tests/fuzz/lines.tcl).
+# A failure prints the make command that replays its batch.
+FUZZ_LINES   ?= 1000000
+FUZZ_SEED    ?= 1
+FUZZ_BATCH   ?= 5000
+FUZZ_TIMEOUT ?= 600
+FUZZ_WITHOUT ?=
+
+.PHONY: fuzz
+
+fuzz: build-sanitize
+	tests/fuzz/run.sh $(SAN_BUILD) $(FUZZ_LINES) $(FUZZ_SEED) $(FUZZ_BATCH) $(FUZZ_TIMEOUT) '$(FUZZ_WITHOUT)'
 
 clean:
 	rm -rf $(BUILD) $(SAN_BUILD) $(BENCH_BUILD)
