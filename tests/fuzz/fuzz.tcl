@@ -4,10 +4,11 @@
 #
 # KELMAR_LIB names the folder of the libraries; the working directory must be a fresh temporary
 # folder, as the lines write files into it (tests/fuzz/run.sh makes one). The lines run in an
-# interpreter of their own, deleted at the end, so that whatever they made must be gone then:
-# LeakSanitizer sees it at exit, and the kit's counts are checked here. -without leaves classes of
-# lines out (see fz::classes in lines.tcl), to explore the others past a known fault. -log writes
-# every line before it runs. The last line of the output is "lines N" when nothing failed.
+# interpreter of their own, the arena, deleted at the end, so that whatever they made must be gone
+# then: LeakSanitizer sees it at exit, and the kit's counts are checked here. -without leaves
+# classes of lines out (see fz::classes in lines.tcl), to explore the others past a known fault.
+# -log writes every line before it runs. The last line of the output is "lines N" when nothing
+# failed.
 
 set options [dict merge {-seed 1 -lines 1000 -without {} -log {}} $argv]
 set here [file dirname [file normalize [info script]]]
@@ -18,12 +19,13 @@ $arena eval [list lappend ::auto_path $env(KELMAR_LIB)]
 $arena eval [list source [file join $here lines.tcl]]
 set ran [$arena eval [list fz::run [dict get $options -seed] [dict get $options -lines] \
     [dict get $options -without] $samples [dict get $options -log]]]
-interp delete $arena
+set without [dict get $options -without]
+if {"teardown" ni $without} { interp delete $arena }
 
 # The kit's helpers and the holders behind its orphans live for the process by design: with all of
-# them made here, nothing else may be left. Loading the kit here is one more load of the package,
-# which lines of the class child do anyway; without them, the count is left out with the load.
-if {"child" ni [dict get $options -without]} {
+# them made here, nothing else may be left. Loading the kit here loads the package once more, as
+# lines of the class child do; without them, the count goes with the load.
+if {"teardown" ni $without && "child" ni $without} {
     lappend auto_path $env(KELMAR_LIB)
     package require TcltaskI_TestKit
     set helpers {hh gg nosuch}

@@ -185,7 +185,9 @@ proc fz::forget {word} {
 }
 # Object words in what a line gave back, or in the variables lines write, join the pool.
 proc fz::harvest {value} {
-    foreach v [list $value [expr {[info exists ::out] ? $::out : ""}]] {
+    set values [list $value]
+    foreach name {::out ::msg ::fz::v ::arr(k)} { if {[info exists $name]} { lappend values [set $name] } }
+    foreach v $values {
         if {[string length $v] > 80 || ![regexp {^::kelmar::([A-Za-z]+?)\d+$} $v -> class]} continue
         if {$class eq "IProjectHelper"} {
             if {![on helper]} continue
@@ -290,14 +292,15 @@ proc fz::mutant {{most 4}} {
 # ---- Lines ----------------------------------------------------------------------------------
 
 # The classes of lines: a weight and the proc that makes a line of the class. -without takes these
-# names, and four more that leave out values and hand-overs rather than lines:
+# names, and five more that leave out values, hand-overs and the end rather than lines:
 #   overflow  numbers beyond the range of a double (1e400) in design files and numeric words
 #   huge      device sizes whose square passes 2^31 (46341, 65536, 100000)
 #   helper    the project helper words the tool gives, as arguments
 #   keep      objects of child interpreters that this one keeps, through its project, after the
 #             child is gone
-# rename and delete also leave out what handlers do of the kind; child also the count of kit
-# objects after the arena is gone (fuzz.tcl), which loads the package once more.
+#   teardown  the deletion of the arena at the end (fuzz.tcl), with the count of kit objects after it
+# rename and delete also leave out what handlers do of the kind, child also that count, which loads
+# the package once more.
 set fz::classes {
     kit 40 kitLine  tool 30 toolLine  design 4 designLine  close 2 closeLine  make 3 makeLine
     rename 2 renameLine  delete 2 deleteLine  namespace 1 namespaceLine  trace 1 traceLine
@@ -445,7 +448,7 @@ proc fz::childGone {kid} {
 }
 proc fz::childCallLine {} {
     variable kids; variable kidWords; variable rows
-    if {![llength $kids]} { return [childLine] }
+    if {![llength $kids]} { return [expr {[on child] ? [childLine] : [kitLine]}] }
     set kid [pick $kids]
     set word [pick [dict get $kidWords $kid]]
     set class [expr {[regexp {^::kelmar::([A-Za-z]+?)\d+$} $word -> c] && [dict exists $rows $c] ? $c : "ITclProject"}]
