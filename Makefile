@@ -4,6 +4,7 @@
 #   make demo    build and run the tour of the reference tool on the sample design
 #   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
 #   make fuzz    seeded random command lines under the sanitizer build (not part of make test)
+#   make memcheck  the Tcl tests under valgrind's memcheck against build/ (not part of make test)
 #   make clean   remove the build folders
 
 BUILD      ?= build
@@ -70,6 +71,18 @@ FUZZ_WITHOUT ?=
 
 fuzz: build-sanitize
 	tests/fuzz/run.sh $(SAN_BUILD) $(FUZZ_LINES) $(FUZZ_SEED) $(FUZZ_BATCH) $(FUZZ_TIMEOUT) '$(FUZZ_WITHOUT)'
+
+# Every Tcl test file under valgrind's memcheck, against the plain build; valgrind is installed like
+# the other packages when missing.
+MEMCHECK_PACKAGES := valgrind
+
+.PHONY: memcheck memcheck-deps
+
+memcheck-deps: deps
+	@$(MAKE) --no-print-directory deps PACKAGES="$(MEMCHECK_PACKAGES)"
+
+memcheck: build memcheck-deps
+	tests/memcheck.sh $(BUILD)
 
 clean:
 	rm -rf $(BUILD) $(SAN_BUILD) $(BENCH_BUILD)
