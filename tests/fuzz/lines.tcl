@@ -27,6 +27,11 @@ proc fz::chance {p} { expr {rand() < $p} }
 proc fz::on {class} { variable off; expr {$class ni $off} }
 # A word of a line: `value` quoted as one word of a script.
 proc fz::q {value} { list $value }
+# The interface in an object word of the scripting support (::kelmar::ICollection7), or "".
+proc fz::classOf {word} {
+    if {[string length $word] > 80 || ![regexp {^::kelmar::([A-Za-z]+?)\d+$} $word -> class]} { return "" }
+    return $class
+}
 
 # ---- Words ----------------------------------------------------------------------------------
 
@@ -85,7 +90,9 @@ set fz::componentIds {5d1e4b7a-2c3f-4e8a-9b6d-0f1a2b3c4d50 5d1e4b7a-2c3f-4e8a-9b
 # One word of a line, by kind: the fragments of `id`, `helper` and `hostile` are script already.
 proc fz::word {{kind {}}} {
     variable words
-    if {$kind eq ""} { set kind [pick {plain plain plain name name option option hostile hostile object id var file helper}] }
+    if {$kind eq ""} {
+        set kind [pick {plain plain plain name name option option hostile hostile object id var file helper}]
+    }
     switch $kind {
         option {
             set name [pick [dict get $words option]]
@@ -143,7 +150,7 @@ proc fz::arguments {class row} {
 proc fz::usages {} {
     variable usages {}
     foreach {root summary} [kelmartool::help] {
-        regexp {^::kelmar::([A-Za-z]+?)\d+$} [interp alias {} $root] -> class
+        set class [classOf [interp alias {} $root]]
         dict set usages $class GetInterface {IFACE {}}
         foreach row [kelmartool::help $root] {
             set text [lindex [split [string map {"Usage: " ""} [kelmartool::help $root $row]] :] 0]
@@ -188,7 +195,8 @@ proc fz::harvest {value} {
     set values [list $value]
     foreach name {::out ::msg ::fz::v ::arr(k)} { if {[info exists $name]} { lappend values [set $name] } }
     foreach v $values {
-        if {[string length $v] > 80 || ![regexp {^::kelmar::([A-Za-z]+?)\d+$} $v -> class]} continue
+        set class [classOf $v]
+        if {$class eq ""} continue
         if {$class eq "IProjectHelper"} {
             if {![on helper]} continue
             variable helpers
@@ -420,23 +428,21 @@ proc fz::spawn {file} {
     $kid eval {package require TcltaskI_TestKit; package require KelmarTool}
     catch {$kid eval [list projmgr Open $file msg]}
     set made [$kid eval {
-        set made {}
-        foreach root {projmgr project collection settings obj view highlight selection search timing floorplan} {
-            lappend made [interp alias {} $root]
-        }
-        lappend made [project GetHDProject] [testkit::new ICollection] [testkit::new ITclProject]
-        lappend made [project GetProjectHelper]
+        set made [lmap {root summary} [kelmartool::help] { interp alias {} $root }]
+        lappend made [project GetHDProject] [project GetProjectHelper] [testkit::new ICollection] \
+            [testkit::new ITclProject]
     }]
     set ::fz::foreign [lrange [concat $::fz::foreign $made] end-59 end]
     dict set ::fz::kidWords $kid $made
     # Objects of the child pass to this interpreter through this project; they stay when it goes.
     if {![on keep]} { return $kid }
     if {[project GetFileName] eq ""} { projmgr Open [mutant 0] msg }
-    foreach root [pick {{projmgr collection search} {obj timing floorplan} {view highlight selection}}] id $componentIds {
+    set roots [pick {{projmgr collection search} {obj timing floorplan} {view highlight selection}}]
+    foreach root $roots id $componentIds {
+        set class [dict get $::fz::tool $root class]
         set ::fz::component [$kid eval [list $root GetInterface $anyId]]
         project RegisterComponent $id ::fz::component
-        set word [[project GetComponent $id] GetInterface [set ::kelmar::TcltaskI::[dict get $::fz::tool $root class]ID]]
-        adopt $word [dict get $::fz::tool $root class]
+        adopt [[project GetComponent $id] GetInterface [set ::kelmar::TcltaskI::${class}ID]] $class
     }
     return $kid
 }
@@ -451,22 +457,27 @@ proc fz::childCallLine {} {
     if {![llength $kids]} { return [expr {[on child] ? [childLine] : [kitLine]}] }
     set kid [pick $kids]
     set word [pick [dict get $kidWords $kid]]
-    set class [expr {[regexp {^::kelmar::([A-Za-z]+?)\d+$} $word -> c] && [dict exists $rows $c] ? $c : "ITclProject"}]
+    set class [classOf $word]
+    if {![dict exists $rows $class]} { set class ITclProject }
     set row [pick [dict get $rows $class]]
     set line "[q $word] [q $row] [arguments $class $row]"
     return "interp eval [q $kid] [q $line]"
 }
-# A component for the current project: any object of the pool or a root, the project itself too.
+# A component for the current project: any object of the pool or a root, or the current project
+# itself; or the component kept under an identifier, or none any more.
 proc fz::registerLine {} {
     variable pool; variable roots
-    set word [pick [concat [dict keys $pool] $roots]]
-    set line "set ::fz::component \[[q $word] GetInterface $::fz::anyId\]; project RegisterComponent [word cid] ::fz::component"
-    pick [list $line "project GetComponent [word cid]" "project UnRegisterComponent ::fz::component"]
+    set word [expr {[chance 0.5] ? {$::fz::current} : [q [pick [concat [dict keys $pool] $roots]]]}]
+    set register "projmgr GetCurrentTclProject ::fz::current msg
+        set ::fz::component \[$word GetInterface $::fz::anyId\]
+        project RegisterComponent [word cid] ::fz::component"
+    pick [list $register "project GetComponent [word cid]" "project UnRegisterComponent ::fz::component"]
 }
 # A line of another class run in a namespace, a procedure body, or with a component fault on.
 proc fz::wrapLine {} {
     set line [line]
-    pick [list "namespace eval ::fzns [q $line]" "apply [q [list {} $line ::fzns::inner]]" "uplevel #0 [q $line]"]
+    pick [list "namespace eval ::fzns [q $line]" "apply [q [list {} $line ::fzns::inner]]" \
+        "uplevel #0 [q $line]"]
 }
 proc fz::faultLine {} {
     set what [pick {libTcltask_Support libArgMatchKit property matcher namelist}]
@@ -525,11 +536,11 @@ proc fz::setup {samples} {
     set roots {}
     foreach {root summary} [kelmartool::help] {
         set word [interp alias {} $root]
-        regexp {^::kelmar::([A-Za-z]+?)\d+$} $word -> class
-        dict set tool $root [dict create command $root words [kelmartool::help $root] class $class]
+        dict set tool $root [dict create command $root words [kelmartool::help $root] class [classOf $word]]
         lappend roots $word
     }
-    dict set tool kelmartool [dict create command kelmartool::help words [list {} {*}[dict keys $tool]] class {}]
+    dict set tool kelmartool [dict create command kelmartool::help words [list {} {*}[dict keys $tool]] \
+        class {}]
     namespace eval tool {}
     rename ::highlight ::fz::tool::highlight
     interp alias {} ::highlight {} ::fz::highlight
