@@ -11,6 +11,7 @@ namespace eval fz {
     variable pool {}         ;# word -> class of the objects that answer commands here
     variable dead {}         ;# words of objects renamed away or deleted
     variable foreign {}      ;# words of objects made in child interpreters
+    variable kept {}         ;# words here of objects made in child interpreters
     variable helpers {}      ;# words of project helpers the tool gave, which are no commands
     variable roots {}        ;# words behind the tool's root commands, kept by the sweeps
     variable kids {}         ;# child interpreters alive
@@ -51,8 +52,8 @@ proc fz::hostileWords {} {
 }
 
 # The word tables: plain values and names of the sample designs, option names from the tool's help,
-# variable names, relative file names, identifiers.
-proc fz::tables {designs} {
+# variable names, relative file names (copies of the samples among them), identifiers.
+proc fz::tables {designs copies} {
     variable words
     set names {}
     foreach text $designs {
@@ -72,7 +73,8 @@ proc fz::tables {designs} {
     dict set words name [lsort -unique $names]
     dict set words option [lsort -unique [string map {? {}} $options]]
     dict set words var {msg out ::fz::v arr arr(k) {} ::nosuch::v ro ::ro(1) a(}
-    dict set words file {d0.json d1.json d2.json out.ucf out.csv out.vhd out.v rep.txt nosuch.json {} . sub/x}
+    dict set words file [concat $copies d0.json d1.json d2.json out.ucf out.csv out.vhd out.v rep.txt nosuch.json \
+        {{}} . sub/x]
     dict set words id [concat [lmap v [info vars ::kelmar::TcltaskI::*ID] {string cat $ $v}] \
         $::fz::anyId 00000000-0000-0000-0000-000000000000 zz]
     dict set words cid [concat $::fz::componentIds $::fz::anyId 00000000-0000-0000-0000-000000000000 {{}}]
@@ -319,7 +321,9 @@ set fz::classes {
 proc fz::kitLine {} {
     variable pool; variable rows
     if {![dict size $pool]} { return "fz::make [pick [dict keys $rows]]" }
-    set word [pick [dict keys $pool]]
+    # Objects of children are a few among many; they get a share of their own.
+    set kept [lmap w $::fz::kept { if {[dict exists $pool $w]} { set w } else continue }]
+    set word [pick [expr {[llength $kept] && [chance 0.1] ? $kept : [dict keys $pool]}]]
     set class [dict get $pool $word]
     set row [pick [dict get $rows $class]]
     return "[q $word] [q $row] [arguments $class $row]"
@@ -437,12 +441,17 @@ proc fz::spawn {file} {
     # Objects of the child pass to this interpreter through this project; they stay when it goes.
     if {![on keep]} { return $kid }
     if {[project GetFileName] eq ""} { projmgr Open [mutant 0] msg }
-    set roots [pick {{projmgr collection search} {obj timing floorplan} {view highlight selection}}]
+    # The child's project manager goes with two other roots: it can open a design in the child's
+    # tool after the child is gone, for the others to work on.
+    set others [lsearch -all -inline -not [dict keys $::fz::tool] kelmartool]
+    set roots [list projmgr [pick $others] [pick $others]]
     foreach root $roots id $componentIds {
         set class [dict get $::fz::tool $root class]
         set ::fz::component [$kid eval [list $root GetInterface $anyId]]
         project RegisterComponent $id ::fz::component
-        adopt [[project GetComponent $id] GetInterface [set ::kelmar::TcltaskI::${class}ID]] $class
+        set word [[project GetComponent $id] GetInterface [set ::kelmar::TcltaskI::${class}ID]]
+        adopt $word $class
+        set ::fz::kept [lrange [lappend ::fz::kept $word] end-29 end]
     }
     return $kid
 }
@@ -519,10 +528,11 @@ proc fz::setup {samples} {
         set channel [open $sample]
         lappend designs [read $channel]
         close $channel
+        file copy $sample [file tail $sample]
     }
     package require TcltaskI_TestKit
     package require KelmarTool
-    tables $designs
+    tables $designs [lmap sample $samples { file tail $sample }]
     usages
     array set ::arr {k v}
     set ::ro 1
