@@ -386,10 +386,24 @@ proc fz::defaultVariables {} {
     foreach ns [defaultSpaces] { lappend vars {*}[info vars ${ns}::*] }
     return $vars
 }
+# A trace on a default variable, or on the renaming and deletion of an object's command.
 proc fz::traceLine {} {
+    variable pool
     set vars [defaultVariables]
-    if {![llength $vars]} { return [kitLine] }
-    return "trace add variable [q [pick $vars]] [q [pick {read write unset {read write unset}}]] ::fz::tracer"
+    if {[llength $vars] && [chance 0.5]} {
+        return "trace add variable [q [pick $vars]] [q [pick {read write unset {read write unset}}]] ::fz::tracer"
+    }
+    if {![dict size $pool]} { return [kitLine] }
+    return "trace add command [q [pick [dict keys $pool]]] {rename delete} ::fz::commandTracer"
+}
+# While an object's command is renamed or deleted: a line, a call of it, another name, its end.
+proc fz::commandTracer {old new op} {
+    switch [upto 4] {
+        0 { act }
+        1 { catch {$old GetInterface $::fz::anyId} }
+        2 { catch {moved $old ::fz_traced[upto 1000]} }
+        3 { catch {rename $old {}} }
+    }
 }
 proc fz::tracer {name1 name2 op} {
     switch [upto 6] {
