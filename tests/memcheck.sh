@@ -18,7 +18,8 @@ set -u
 build=$(cd "$1" && pwd)
 here=$(cd "$(dirname "$0")" && pwd)
 logs=$(mktemp -d "${TMPDIR:-/tmp}/kelmar-memcheck.XXXXXX")
-trap 'rm -rf "$logs"' EXIT INT TERM
+trap 'rm -rf "$logs"' EXIT
+trap 'exit 130' INT TERM HUP PIPE
 
 failed=""
 for test in "$here"/tcl/*.test; do

@@ -16,7 +16,8 @@ export ASAN_OPTIONS LSAN_OPTIONS UBSAN_OPTIONS KELMAR_LIB="$build/lib"
 
 # Everything a batch writes stays in this folder, emptied before each batch and removed at the end.
 work=$(mktemp -d "${TMPDIR:-/tmp}/kelmar-fuzz.XXXXXX")
-trap 'rm -rf "$work"' EXIT INT TERM
+trap 'rm -rf "$work"' EXIT
+trap 'exit 130' INT TERM HUP PIPE
 
 ran=0 batches=0 start=$(date +%s)
 while [ "$ran" -lt "$lines" ]; do
