@@ -393,8 +393,11 @@ proc fz::traceLine {} {
     if {[llength $vars] && [chance 0.5]} {
         return "trace add variable [q [pick $vars]] [q [pick {read write unset {read write unset}}]] ::fz::tracer"
     }
-    if {![dict size $pool]} { return [kitLine] }
-    return "trace add command [q [pick [dict keys $pool]]] {rename delete} ::fz::commandTracer"
+    # One trace a command at most: Tcl 8.6.13 itself crashes when a command with two traces on
+    # rename and delete is deleted by the first of them while it is renamed.
+    set word [pick [dict keys $pool]]
+    if {$word eq "" || [catch {trace info command $word} traces] || $traces ne ""} { return [kitLine] }
+    return "trace add command [q $word] {rename delete} ::fz::commandTracer"
 }
 # While an object's command is renamed or deleted: a line, a call of it, another name, its end.
 proc fz::commandTracer {old new op} {
