@@ -3,6 +3,8 @@
 #   make test    build and run every test, then again under AddressSanitizer and UBSan
 #   make demo    build and run the tour of the reference tool on the sample design
 #   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
+#   make fuzz    seeded random command lines under the sanitizer build (not part of make test)
+#   make memcheck  the Tcl tests under valgrind's memcheck against build/ (not part of make test)
 #   make clean   remove the build folders
 
 BUILD      ?= build
@@ -11,7 +13,7 @@ JOBS       ?= 2
 PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev tcl-thread libgtest-dev nlohmann-json3-dev
 CMAKE_ARGS ?=
 
-.PHONY: deps build test test-plain test-sanitize clean demo
+.PHONY: deps build build-sanitize test test-plain test-sanitize clean demo
 
 deps:
 	@missing=""; for p in $(PACKAGES); do \
@@ -29,9 +31,11 @@ build: deps
 test-plain: build
 	ctest --test-dir $(BUILD) --output-on-failure -j $(JOBS)
 
-test-sanitize: deps
+build-sanitize: deps
 	cmake -S . -B $(SAN_BUILD) -DKELMAR_SANITIZE=ON -DCMAKE_BUILD_TYPE=Debug $(CMAKE_ARGS)
 	cmake --build $(SAN_BUILD) -j $(JOBS)
+
+test-sanitize: build-sanitize
 	ctest --test-dir $(SAN_BUILD) --output-on-failure -j $(JOBS)
 
 test: test-plain test-sanitize
@@ -53,6 +57,32 @@ bench: bench-deps
 	cmake -S . -B $(BENCH_BUILD) -DCMAKE_BUILD_TYPE=Release -DKELMAR_BENCH=ON $(CMAKE_ARGS)
 	cmake --build $(BENCH_BUILD) -j $(JOBS) --target run_bench
 	mkdir -p $(BUILD) && cp $(BENCH_BUILD)/bench.json $(BUILD)/bench.json
+
+# The fuzzer runs FUZZ_LINES lines in batches of FUZZ_BATCH, one process and seed each, from
+# FUZZ_SEED on; FUZZ_WITHOUT names classes of lines to leave out (see tests/fuzz/lines.tcl).
+# A failure prints the make command that replays its batch.
+FUZZ_LINES   ?= 1000000
+FUZZ_SEED    ?= 1
+FUZZ_BATCH   ?= 5000
+FUZZ_TIMEOUT ?= 600
+FUZZ_WITHOUT ?=
+
+.PHONY: fuzz
+
+fuzz: build-sanitize
+	tests/fuzz/run.sh $(SAN_BUILD) $(FUZZ_LINES) $(FUZZ_SEED) $(FUZZ_BATCH) $(FUZZ_TIMEOUT) '$(FUZZ_WITHOUT)'
+
+# Every Tcl test file under valgrind's memcheck, against the plain build; valgrind is installed like
+# the other packages when missing.
+MEMCHECK_PACKAGES := valgrind
+
+.PHONY: memcheck memcheck-deps
+
+memcheck-deps: deps
+	@$(MAKE) --no-print-directory deps PACKAGES="$(MEMCHECK_PACKAGES)"
+
+memcheck: build memcheck-deps
+	tests/memcheck.sh $(BUILD)
 
 clean:
 	rm -rf $(BUILD) $(SAN_BUILD) $(BENCH_BUILD)
