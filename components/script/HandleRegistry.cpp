@@ -258,7 +258,10 @@ void HandleRegistry::SetWord(PtrHandleBase* handle, Tcl_Obj* word) {
 }
 
 Tcl_Obj* HandleRegistry::HandOver(PtrHandleBase* handle, Tcl_Interp* interp) {
-    if (handle->m_word != nullptr) return handle->m_word;
+    if (handle->m_word != nullptr) {
+        Follow(handle);
+        return handle->m_word;
+    }
     State& state = TheState();
     if (interp == nullptr) {
         // Nobody can take it over; the support still owns it from here on.
@@ -270,6 +273,7 @@ Tcl_Obj* HandleRegistry::HandOver(PtrHandleBase* handle, Tcl_Interp* interp) {
     const ValueKey key{interp, handle->m_value,
                        std::type_index(handle->m_identity != nullptr ? *handle->m_identity : typeid(*handle))};
     if (auto it = state.byValue.find(key); it != state.byValue.end()) {
+        Follow(it->second);
         SetWord(handle, it->second->m_word);
         state.pending.push_back({handle, interp});
         return handle->m_word;
@@ -283,8 +287,6 @@ Tcl_Obj* HandleRegistry::HandOver(PtrHandleBase* handle, Tcl_Interp* interp) {
         return nullptr;
     }
     SetWord(handle, Tcl_NewStringObj(word.data(), static_cast<int>(word.size())));
-    // A script may rename the command; the word a later hand-over gives must follow it.
-    Tcl_TraceCommand(interp, word.c_str(), TCL_TRACE_RENAME, CommandRenamed, handle);
     state.byValue.emplace(key, handle);
     AddWord(state, word, handle);
     state.records.emplace(handle, Record{interp, token, key, std::move(word)});
@@ -340,6 +342,8 @@ void HandleRegistry::EndPending() {
 
 int HandleRegistry::ObjectCommand(ClientData data, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
     auto* handle = static_cast<PtrHandleBase*>(data);
+    // Called by another name than its word: the command may have been renamed.
+    if (objv[0] != handle->m_word && TextOf(objv[0]) != TextOf(handle->m_word)) Follow(handle);
     State& state = TheState();
     CallDepth depth(state);
     // Tcl is C: nothing may unwind through it.
@@ -368,19 +372,26 @@ void HandleRegistry::CommandDeleted(ClientData data) {
     }
 }
 
-void HandleRegistry::CommandRenamed(ClientData data, Tcl_Interp*, const char*, const char* newName, int flags) {
-    // Deletion comes through CommandDeleted; only a move to another name is followed here.
-    if ((flags & TCL_TRACE_DESTROYED) != 0 || newName == nullptr || *newName == '\0') return;
-    auto* handle = static_cast<PtrHandleBase*>(data);
+// The name of the command now, which a script may have changed by rename since the record was made.
+// Asked for at hand-over and when the command is called by another name, rather than told by a
+// command trace: Tcl 8.6 frees a command's next trace when an earlier one deletes the command
+// during a rename, so a trace of ours would let any script's own trace crash the process.
+void HandleRegistry::Follow(PtrHandleBase* handle) {
     State* state = t_state;
     if (state == nullptr) return;
     auto it = state->records.find(handle);
     if (it == state->records.end()) return;
     Record& record = it->second;
-    DropWord(*state, record.word, handle);
-    record.word = newName;
-    AddWord(*state, record.word, handle);
-    SetWord(handle, Tcl_NewStringObj(record.word.data(), static_cast<int>(record.word.size())));
+    Tcl_Obj* name = Tcl_NewObj();
+    Tcl_IncrRefCount(name);
+    Tcl_GetCommandFullName(record.interp, record.token, name);
+    if (const std::string_view now = TextOf(name); !now.empty() && now != record.word) {
+        DropWord(*state, record.word, handle);
+        record.word = now;
+        AddWord(*state, record.word, handle);
+        SetWord(handle, name);
+    }
+    Tcl_DecrRefCount(name);
 }
 
 void HandleRegistry::InterpDeleted(ClientData, Tcl_Interp* interp) {

@@ -1,6 +1,6 @@
 // Script::HandleRegistry: the Tcl side of the pointer handles. It gives a handle its word and object
-// command, finds the handle behind a word, follows a word that `rename` moves, and ends the handles
-// the support owns.
+// command, finds the handle behind a word, follows a command that `rename` moved (at hand-over, and
+// when the command is called by its new name), and ends the handles the support owns.
 //
 // Ownership: a handle handed to Tcl belongs to its object command; deleting the command ends it
 // (ReleaseValue, then the destructor). A handle handed over for a value that already has a word under
@@ -45,8 +45,7 @@ public:
 private:
     static int ObjectCommand(ClientData data, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]);
     static void CommandDeleted(ClientData data);
-    static void CommandRenamed(ClientData data, Tcl_Interp* interp, const char* oldName, const char* newName,
-                               int flags);
+    static void Follow(PtrHandleBase* handle);
     static void InterpDeleted(ClientData data, Tcl_Interp* interp);
     static void SetWord(PtrHandleBase* handle, Tcl_Obj* word);
 };
