@@ -115,7 +115,7 @@ proc fz::word {{kind {}}} {
 proc fz::words {max} {
     set out {}
     for {set k [upto [expr {$max + 1}]]} {$k > 0} {incr k -1} { lappend out [word] }
-    join $out
+    return $out
 }
 
 # The words of a call of `row` of `class`. Mostly they follow the row's usage in the tool's help:
@@ -123,7 +123,7 @@ proc fz::words {max} {
 # them is replaced by any word, or some words are added, or all words are random.
 proc fz::arguments {class row} {
     variable usages
-    if {[chance 0.1] || ![dict exists $usages $class $row]} { return [words 6] }
+    if {[chance 0.1] || ![dict exists $usages $class $row]} { return [guarded $row [words 6]] }
     lassign [dict get $usages $class $row] positionals options
     set out {}
     foreach placeholder $positionals {
@@ -143,8 +143,14 @@ proc fz::arguments {class row} {
         lappend out [q [string range $name 0 [expr {1 + [upto [string length $name]]}]]]
         if {[chance 0.5]} { lappend out [word [pick {plain name plain hostile}]] }
     }
-    if {[chance 0.1]} { lappend out [words 2] }
-    join $out
+    if {[chance 0.1]} { lappend out {*}[words 2] }
+    guarded $row $out
+}
+# The words of a call as a line's text. The body that foreach evaluates is a script by its nature,
+# so the words that count a fault when evaluated stay out of that row.
+proc fz::guarded {row words} {
+    if {$row eq "foreach"} { set words [lsearch -all -inline -not -regexp $words {^\$::W\((script|varsub)\)$}] }
+    join $words
 }
 
 # The usage of every command word of the tool's help, by the class of the root's object:
