@@ -12,6 +12,7 @@
 
 #include "Script/TclWrapSupport.h"
 #include "marshal/declare.h"
+#include "marshal/default_line.h"
 #include "marshal/fetch_value.h"
 #include "marshal/options.h"
 #include "marshal/property.h"
@@ -137,10 +138,12 @@ struct OptionFrame {
         static thread_local DefaultLine line;
         if (line.line == nullptr) MakeDefaultLine(line, W::kClassName, D.word, D.options[K], kMatched);
         const Option& option = D.options[K];
-        if (RunDefaultLine(interp, line) != TCL_OK) return ReportDefaultFailure(interp, option.name, TypeWord<T>());
-        Script::TclObjHandleBase variable(line.variable);
+        Script::TclObjRef set;
+        if (SetDefault(interp, line, set) != TCL_OK) return ReportDefaultFailure(interp, option.name, TypeWord<T>());
+        // The value itself when nothing watches the variable, else the variable read back.
+        Script::TclObjHandleBase word(set ? set.get() : line.variable);
         T& value = std::get<K>(values.options);
-        if (FetchValue(value, interp, &variable, Script::INOUT) != 0)
+        if (FetchValue(value, interp, &word, set ? Script::IN : Script::INOUT) != 0)
             return ReportDefaultFailure(interp, option.name, TypeWord<T>());
         if constexpr (std::is_same_v<T, UtilI::TclPropertyList>) values.listHoldsDefault[K] = true;
         return 0;

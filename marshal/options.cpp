@@ -125,22 +125,6 @@ int PositionalScan(int argc, Script::Handle* const* words, const Option* options
     return argc;
 }
 
-void MakeDefaultLine(DefaultLine& out, const char* className, const char* word, const Option& option, bool matched) {
-    const Port_String variable = matched ? Port_String("__", option.name, "__") : Port_String(option.name);
-    // The variable is declared in the namespace first: without that, Tcl would write a global variable
-    // of the same name when one exists (plain names such as `in` or `name` of zoom), and the read-back
-    // of the namespace variable would fail.
-    Port_String line("namespace eval ", className, "::", word, " {variable ", variable.c_str(), "; ");
-    line += Port_String("set ", variable.c_str(), " ", option.defaultText, "}");
-    const Port_String qualified(className, "::", word, "::", variable.c_str());
-    out.line = Tcl_NewStringObj(line.c_str(), line.Length());
-    Tcl_IncrRefCount(out.line);
-    out.variable = Tcl_NewStringObj(qualified.c_str(), qualified.Length());
-    Tcl_IncrRefCount(out.variable);
-}
-
-int RunDefaultLine(Tcl_Interp* interp, const DefaultLine& line) { return Tcl_EvalObjEx(interp, line.line, 0); }
-
 int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord) {
     return ErrorReport(interp, Port_String("\nFailure(s) took place while retrieving the default value for ",
                                            "\noptional argument '", name, "' of type '", typeWord, "'"));

@@ -1,6 +1,5 @@
 // The option passes of the matched and switch frames that do not depend on a command's types: the
-// matcher set-up, the matching pass, the positional scan, the default lines and the texts of the
-// option failures.
+// matcher set-up, the matching pass, the positional scan and the texts of the option failures.
 #pragma once
 
 #include <tcl.h>
@@ -64,19 +63,6 @@ inline const char* WordText(Script::Handle* handle) {
     const char* text = handle->GetString();
     return text != nullptr ? text : "";
 }
-
-// The default line of one option and the name of its variable, made once per thread and kept, so
-// that Tcl reuses the compiled line on every call.
-struct DefaultLine {
-    Tcl_Obj* line = nullptr;
-    Tcl_Obj* variable = nullptr;
-};
-// "namespace eval <class>::<word> {variable <var>; set <var> <default>}" and
-// "<class>::<word>::<var>", with <var> the name in two underscores either side in a matched method
-// and bare in a switch method. Both names are relative: they resolve from the namespace Tcl is in.
-void MakeDefaultLine(DefaultLine& out, const char* className, const char* word, const Option& option, bool matched);
-// Runs the line, as Tcl_Eval of its text would; gives the Tcl code.
-int RunDefaultLine(Tcl_Interp* interp, const DefaultLine& line);
 
 int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord);
 int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord);
