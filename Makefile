@@ -3,6 +3,7 @@
 #   make test    build and run every test, then again under AddressSanitizer and UBSan
 #   make demo    build and run the tour of the reference tool on the sample design
 #   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
+#   make bench-icount  the same cases in instructions per call, counted under valgrind's callgrind
 #   make fuzz    seeded random command lines under the sanitizer build (not part of make test)
 #   make memcheck  the Tcl tests under valgrind's memcheck against build/ (not part of make test)
 #   make clean   remove the build folders
@@ -44,19 +45,30 @@ demo: build
 	$(BUILD)/bin/kelmarsh -project examples/designs/counter.json examples/tour.tcl
 
 # The benchmark has its own Release build folder and its own packages: swig makes the
-# generated-binding baseline. The figures land in $(BENCH_BUILD)/bench.json, copied to $(BUILD)/.
+# generated-binding baseline, valgrind counts the instructions of bench-icount. The figures land in
+# $(BENCH_BUILD)/bench.json and bench-icount.json, copied to $(BUILD)/.
 BENCH_BUILD    ?= build-bench
 BENCH_PACKAGES := swig
+ICOUNT_PACKAGES := valgrind
 
-.PHONY: bench bench-deps
+BENCH_CONFIGURE = cmake -S . -B $(BENCH_BUILD) -DCMAKE_BUILD_TYPE=Release -DKELMAR_BENCH=ON $(CMAKE_ARGS)
+
+.PHONY: bench bench-deps bench-icount
 
 bench-deps: deps
 	@$(MAKE) --no-print-directory deps PACKAGES="$(BENCH_PACKAGES)"
 
 bench: bench-deps
-	cmake -S . -B $(BENCH_BUILD) -DCMAKE_BUILD_TYPE=Release -DKELMAR_BENCH=ON $(CMAKE_ARGS)
+	$(BENCH_CONFIGURE)
 	cmake --build $(BENCH_BUILD) -j $(JOBS) --target run_bench
 	mkdir -p $(BUILD) && cp $(BENCH_BUILD)/bench.json $(BUILD)/bench.json
+
+# Valgrind goes in before the build is configured: the native extension finds its header then.
+bench-icount: bench-deps
+	@$(MAKE) --no-print-directory deps PACKAGES="$(ICOUNT_PACKAGES)"
+	$(BENCH_CONFIGURE)
+	cmake --build $(BENCH_BUILD) -j $(JOBS) --target run_bench_icount
+	mkdir -p $(BUILD) && cp $(BENCH_BUILD)/bench-icount.json $(BUILD)/bench-icount.json
 
 # The fuzzer runs FUZZ_LINES lines in batches of FUZZ_BATCH, one process and seed each, from
 # FUZZ_SEED on; FUZZ_WITHOUT names classes of lines to leave out (see tests/fuzz/lines.tcl).
