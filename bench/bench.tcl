@@ -113,10 +113,10 @@ proc bench::Setup {} {
     Case close "plain method" {$project Close} -kit project -goal 2400
     Case sync "plain method with OUT variable" {$project Sync msg} -kit project
     Case get "matched, no options" {$coll get x} -kit coll -goal 5000
-    Case equal "matched, one bool option given" {$coll equal a b -order} -kit coll -goal plainequal
+    Case equal "matched, one bool option given" {$coll equal a b -order} -kit coll -goal 9879
     Case add "matched, tail of 8" {$sel add a b c d e f g h} -kit sel -goal 14000
     Case search "matched, list options" {$search search x -type a -type b -in c} -kit search -goal 24000
-    Case zoom "switch, eleven options" {$view zoom -in -name n} -kit view -goal plainzoom
+    Case zoom "switch, eleven options" {$view zoom -in -name n} -kit view -goal 17044
     Case hl "default that runs a command" {$hl add a} -kit hl -goal 12000
     Case toolequal "tool: matched, one bool option" {$tcoll equal x x -order} -goal 10000
     Case toolzoom "tool: switch, eleven options" {$tview zoom -in -name r0} -goal 34000
