@@ -47,8 +47,6 @@ XUID::XUID(const char* text) noexcept : m_first(0), m_second(0), m_flag(0) {
     m_second = halves[1];
 }
 
-XUID::~XUID() = default;
-
 StringBase<char> XUID::ToString() const {
     static constexpr char kDigits[] = "0123456789abcdef";
     char text[kTextLength];

@@ -26,7 +26,8 @@ public:
     explicit XUID(const char* text) noexcept;
     XUID(const XUID&) noexcept = default;
     XUID& operator=(const XUID&) noexcept = default;
-    virtual ~XUID();
+    // Inline, so that the temporary made from a literal at every GetInterface costs no call.
+    virtual ~XUID() = default;
 
     uint64_t First() const noexcept { return m_first; }
     uint64_t Second() const noexcept { return m_second; }
