@@ -15,6 +15,7 @@
 #include <atomic>
 #include <cstring>
 #include <mutex>
+#include <type_traits>
 
 #include "Port/Init.h"
 
@@ -42,11 +43,14 @@ std::atomic<int> g_libraryOpens{0};
 std::atomic<Factory::LoadFilter> g_loadFilter{nullptr};
 std::atomic<Factory::CreateFilter> g_createFilter{nullptr};
 
-// Never destroyed: a library may register or be asked for while the process winds down.
-std::mutex& WriterLock() {
-    static std::mutex* const lock = new std::mutex;
-    return *lock;
-}
+// Writers take this lock among themselves. It lives in static storage with no constructor or
+// destructor to run, so it is there for a registration during another library's static
+// initialisation or teardown, and it is no block of memory that an unloaded library would leave
+// behind.
+constinit std::mutex g_writerLock;
+static_assert(std::is_trivially_destructible_v<std::mutex>);
+
+std::mutex& WriterLock() { return g_writerLock; }
 
 template <class Entry>
 void FreeList(std::atomic<Entry*>& head) noexcept {

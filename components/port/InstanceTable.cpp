@@ -11,6 +11,8 @@
 
 #include <atomic>
 #include <mutex>
+#include <type_traits>
+#include <utility>
 #include <new>
 
 #include "Port/Init.h"
@@ -37,11 +39,14 @@ std::atomic<int> g_inits{0};
 std::atomic<const Watcher*> g_watcher{nullptr};
 const Watcher* g_retired = nullptr;  // replaced pairs, under the writers' lock
 
-// Never destroyed: components may die while the process winds down.
-std::mutex& WriterLock() {
-    static std::mutex* const lock = new std::mutex;
-    return *lock;
-}
+// Writers take this lock among themselves. It lives in static storage with no constructor or
+// destructor to run, so it is there for a registration during another library's static
+// initialisation or teardown, and it is no block of memory that an unloaded library would leave
+// behind.
+constinit std::mutex g_writerLock;
+static_assert(std::is_trivially_destructible_v<std::mutex>);
+
+std::mutex& WriterLock() { return g_writerLock; }
 
 LiveCount* Find(const Port::XUID& classId) noexcept {
     for (LiveCount* entry = g_table.load(std::memory_order_acquire); entry; entry = entry->next) {
@@ -50,6 +55,7 @@ LiveCount* Find(const Port::XUID& classId) noexcept {
     return nullptr;
 }
 
+// Under the writers' lock. The observer goes with the table: a death after this tells nobody.
 void TearDown() noexcept {
     LiveCount* entry = g_table.exchange(nullptr, std::memory_order_acq_rel);
     while (entry) {
@@ -57,6 +63,8 @@ void TearDown() noexcept {
         delete entry;
         entry = next;
     }
+    delete g_watcher.exchange(nullptr, std::memory_order_acq_rel);
+    while (g_retired) delete std::exchange(g_retired, g_retired->retired);
 }
 
 // Counting is a diagnosis: when no memory is left for a new class's row, that class goes uncounted

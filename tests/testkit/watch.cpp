@@ -89,6 +89,18 @@ bool CreateAllowed(const Port::XUID& classId) {
 
 }  // namespace
 
+// The observer and the filters are functions of this library: when it is unloaded (Tcl unloads
+// what it loaded as it finalizes) they must not be called any more.
+namespace {
+struct StopWatchingOnUnload {
+    ~StopWatchingOnUnload() {
+        CitP::InstanceTable::SetObserver(nullptr, nullptr);
+        CitP::Factory::SetLoadFilter(nullptr);
+        CitP::Factory::SetCreateFilter(nullptr);
+    }
+} s_stopWatchingOnUnload;
+}  // namespace
+
 void StartWatching() noexcept {
     CitP::InstanceTable::SetObserver(&OnDeath, nullptr);
     CitP::Factory::SetLoadFilter(&LoadAllowed);
