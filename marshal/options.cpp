@@ -42,10 +42,14 @@ MatchSession::~MatchSession() {
     m_matches.Release();
 }
 
-int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count) {
+bool RequestComponentLibraries() {
     static const Port_String kSupport("libTcltask_Support");
     static const Port_String kArgMatch("libArgMatchKit");
-    const bool loaded = CitP::Factory::LoadLibraryFactory(kSupport) && CitP::Factory::LoadLibraryFactory(kArgMatch);
+    return CitP::Factory::LoadLibraryFactory(kSupport) && CitP::Factory::LoadLibraryFactory(kArgMatch);
+}
+
+int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count) {
+    const bool loaded = RequestComponentLibraries();
     m_matcher = CommonI::RefCountPtr<ICmdArgMatcher>(CitP::Factory::CreateInstanceRef(CmdArgMatcherID));
     m_matches = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));
     m_valid = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));

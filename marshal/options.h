@@ -52,6 +52,11 @@ private:
     std::vector<std::unique_ptr<Script::TclStringHandle>> m_heapWords;
 };
 
+// Requests the component libraries that matched and switch methods use (the matcher and the
+// property component); true when both are there. Matched methods ask on every call; the package
+// entry asks once, for the switch methods, which never ask.
+bool RequestComponentLibraries();
+
 // The position of the first word that, without its leading dash, is exactly a declared name; argc
 // when there is none.
 int PositionalScan(int argc, Script::Handle* const* words, const Option* options, size_t count);

@@ -1,6 +1,7 @@
 // The package entry and the table of identifier variables.
 #include "Script/KelmarPkg.h"
 #include "Script/TclWrapSupport.h"
+#include "marshal/options.h"
 #include "package/static_init.h"
 #include "wrappers/registration.h"
 
@@ -26,10 +27,14 @@ Script::TclWrapIDEntry identifierTable[] = {
 
 }  // namespace
 
-// Brings up the scripting support, registers the eleven wrapper factories and publishes the
-// identifiers. Checks nothing and always gives TCL_OK.
+// Brings up the scripting support, requests the component libraries, registers the eleven wrapper
+// factories and publishes the identifiers. Checks nothing and always gives TCL_OK: a library that
+// cannot be loaded now fails the first matched call with the loader failure, and a switch method's
+// default with the default failure.
 extern "C" __attribute__((visibility("default"))) int Tcltaski_morvane_Init(Tcl_Interp* interp) {
     Kelmarpkg_Init(interp);
+    // Switch methods never request them; without them their property defaults could not be made.
+    TcltaskI::RequestComponentLibraries();
     TcltaskI::RegisterWrapperFactories();
     Script::TclWrapSupport::CreateVariables(interp, identifierTable);
     return TCL_OK;
