@@ -99,8 +99,6 @@ proc bench::Setup {} {
     set ::tcoll collection
     set ::tview view
     $::tcoll set x {r0 r1}
-    # The switch methods take the property component library for granted; a matched method loads it.
-    $::tcoll get x
 
     Case native "native limit" {$native x}
     if {[dict get $opt -swig] ne {}} {
