@@ -15,6 +15,33 @@ namespace {
 
 const char* g_project = nullptr;
 
+// The message of a failed script once, then the trace of where it failed. An error of the package
+// puts its text into the result and adds it to errorInfo, which then begins with the text twice.
+void ReportScriptError(Tcl_Interp* interp) {
+    const std::string message = Tcl_GetStringResult(interp);
+    const char* info = Tcl_GetVar2(interp, "errorInfo", nullptr, TCL_GLOBAL_ONLY);
+    std::string trace = info != nullptr ? info : message;
+    if (!message.empty() && trace.compare(0, 2 * message.size(), message + message) == 0)
+        trace.erase(0, message.size());
+    std::fprintf(stderr, "%s\n", trace.c_str());
+}
+
+// A script given on the command line runs here rather than in Tcl_Main, so that its failure is told
+// by ReportScriptError. The shell ends with the script, as Tcl's own does: 0, or 1 on failure.
+void RunScript(Tcl_Interp* interp) {
+    const char* encoding = nullptr;
+    Tcl_Obj* script = Tcl_GetStartupScript(&encoding);
+    if (script == nullptr) return;
+    Tcl_IncrRefCount(script);
+    const int code = Tcl_FSEvalFileEx(interp, script, encoding);
+    Tcl_DecrRefCount(script);
+    if (code != TCL_OK) {
+        ReportScriptError(interp);
+        Tcl_Exit(1);
+    }
+    Tcl_Exit(0);
+}
+
 int AppInit(Tcl_Interp* interp) {
     if (Tcl_Init(interp) != TCL_OK) return TCL_ERROR;
     static const char* const kSetup =
@@ -37,6 +64,7 @@ int AppInit(Tcl_Interp* interp) {
         }
         Tcl_ResetResult(interp);
     }
+    RunScript(interp);
     return TCL_OK;
 }
 
