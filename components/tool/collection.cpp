@@ -80,7 +80,12 @@ public:
                 Tcl_AddErrorInfo(interp, "\n    (\"collection foreach\" body)");
                 return Fail(message, Tcl_GetStringResult(interp));
             }
-            break;  // return and other codes end the walk like the end of the collection
+            // The answer of an operation is a value or a failure: a return, or a code of the script's
+            // own, cannot pass through it, and is not to be lost.
+            return Fail(message, (code == TCL_RETURN ? std::string("\"return\"")
+                                                     : "the code " + std::to_string(code)) +
+                                     " cannot leave the body of collection foreach: the walk stopped at '" + member +
+                                     "'");
         }
         Tcl_ResetResult(interp);
         result = nullptr;
