@@ -1,11 +1,13 @@
 // Brings the tool up in an interpreter: its state, the root object commands (projmgr, project,
 // collection, settings, obj, view, highlight, selection, search, timing, floorplan) and the
-// convenience commands kelmartool::open and kelmartool::help.
+// convenience commands kelmartool::open and kelmartool::help, which is also `help` unless the
+// interpreter has a help of its own.
 #include <tcl.h>
 
 #include <cstring>
 #include <exception>
 #include <string>
+#include <string_view>
 
 #include "CitI/IScriptHandle.h"
 #include "Port/Init.h"
@@ -92,11 +94,39 @@ constexpr Root kRoots[] = {
     {"floorplan", TcltaskI::IXFloorplan::NAME},
 };
 
-// kelmartool::help ?ROOT? ?WORD?: the root words with what they are, the command words of one
-// root, or the usage of one command word; the same texts a wrong call shows.
+// The interface a help word is about: a root word, or the word of an object of one of the roots'
+// interfaces, with or without its namespace (`::kelmar::ICollection3` or `ICollection3`, as a wrong
+// count names it). An object word is the interface's name followed by a number.
+const char* InterfaceOf(std::string_view word) {
+    for (const Root& root : kRoots)
+        if (word == root.word) return root.interfaceName;
+    constexpr std::string_view kNamespace = "::kelmar::";
+    if (word.starts_with(kNamespace)) word.remove_prefix(kNamespace.size());
+    const std::size_t end = word.find_last_not_of("0123456789");
+    if (end == std::string_view::npos || end + 1 == word.size()) return nullptr;
+    const std::string_view type = word.substr(0, end + 1);
+    for (const Root& root : kRoots)
+        if (type == root.interfaceName) return root.interfaceName;
+    return nullptr;
+}
+
+// Why a word is neither a root nor an object help knows, with what help does know.
+Tcl_Obj* UnknownHelpWord(const char* word) {
+    std::string roots, interfaces;
+    for (const Root& root : kRoots) {
+        roots += std::string(roots.empty() ? "" : " ") + root.word;
+        interfaces += std::string(interfaces.empty() ? "" : " ") + root.interfaceName;
+    }
+    return Tcl_ObjPrintf("no root command or object of the tool is named \"%s\": give a root (%s) or an object of "
+                         "their interfaces (%s)",
+                         word, roots.c_str(), interfaces.c_str());
+}
+
+// help ?ROOT? ?WORD?, also kelmartool::help: the root words with what they are, the command words of
+// one root or object, or the usage of one command word; the same texts a wrong call shows.
 int HelpCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
     if (objc > 3) {
-        Tcl_WrongNumArgs(interp, 1, objv, "?root? ?word?");
+        Tcl_WrongNumArgs(interp, 1, objv, "?root|object? ?word?");
         return TCL_ERROR;
     }
     if (objc == 1) {
@@ -110,15 +140,15 @@ int HelpCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[])
         return TCL_OK;
     }
     const char* word = Tcl_GetString(objv[1]);
-    for (const Root& root : kRoots) {
-        if (std::strcmp(root.word, word) != 0) continue;
-        CommonI::RefCountPtr<ICommandHelp> help(kelmartool::NewCommandHelp(root.interfaceName));
-        const Port_String text = objc == 2 ? help->GetTopics() : help->GetHelp(Tcl_GetString(objv[2]));
-        Tcl_SetObjResult(interp, Tcl_NewStringObj(text.c_str(), text.Length()));
-        return TCL_OK;
+    const char* interfaceName = InterfaceOf(word);
+    if (interfaceName == nullptr) {
+        Tcl_SetObjResult(interp, UnknownHelpWord(word));
+        return TCL_ERROR;
     }
-    Tcl_SetObjResult(interp, Tcl_ObjPrintf("no root command is named \"%s\"", word));
-    return TCL_ERROR;
+    CommonI::RefCountPtr<ICommandHelp> help(kelmartool::NewCommandHelp(interfaceName));
+    const Port_String text = objc == 2 ? help->GetTopics() : help->GetHelp(Tcl_GetString(objv[2]));
+    Tcl_SetObjResult(interp, Tcl_NewStringObj(text.c_str(), text.Length()));
+    return TCL_OK;
 }
 
 }  // namespace
@@ -157,5 +187,9 @@ extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp
 
     Tcl_CreateObjCommand(interp, "::kelmartool::open", OpenCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::help", HelpCommand, nullptr, nullptr);
+    // The wrong-count messages of the package ask for `help`; a help of the interpreter's own stays.
+    Tcl_CmdInfo existing;
+    if (Tcl_GetCommandInfo(interp, "::help", &existing) == 0)
+        Tcl_CreateObjCommand(interp, "::help", HelpCommand, nullptr, nullptr);
     return TCL_OK;
 }
