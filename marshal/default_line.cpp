@@ -15,6 +15,7 @@
 
 #include <cstddef>
 #include <cstring>
+#include <optional>
 
 #include "Port/StringBase.h"
 
@@ -157,9 +158,12 @@ int SetDefault(Tcl_Interp* interp, const DefaultLine& line, Script::TclObjRef& v
         space = Tcl_CreateNamespace(interp, Tcl_GetString(line.space), nullptr, nullptr);
         if (space == nullptr) return TCL_ERROR;
     }
-    NamespaceFrame frame(interp, space, line.frameWords);
+    // The frame is pushed only where a script may run in it: a command default, or a variable that
+    // Tcl's own commands must set. A literal given to a plain variable runs nothing.
+    std::optional<NamespaceFrame> frame;
     Script::TclObjRef got(line.literal);
     if (!line.command.empty()) {
+        frame.emplace(interp, space, line.frameWords);
         const int code = Tcl_EvalObjv(interp, static_cast<int>(line.command.size()), line.command.data(), 0);
         if (code != TCL_OK) return code;
         got = Script::TclObjRef(Tcl_GetObjResult(interp));
@@ -174,6 +178,7 @@ int SetDefault(Tcl_Interp* interp, const DefaultLine& line, Script::TclObjRef& v
         value = std::move(got);
         return TCL_OK;
     }
+    if (!frame) frame.emplace(interp, space, line.frameWords);
     return DeclareAndSet(interp, line.name, got.get());
 }
 
