@@ -1,6 +1,7 @@
 // Tcl values in and out of the tool, through the property component of the support library.
 #include "property.h"
 
+#include <charconv>
 #include <cmath>
 #include <cstdio>
 #include <functional>
@@ -15,13 +16,49 @@ Tcl_Obj* NewText(std::string_view text) { return Tcl_NewStringObj(text.data(), s
 
 Tcl_Obj* NewInt(long long value) { return Tcl_NewWideIntObj(static_cast<Tcl_WideInt>(value)); }
 
+namespace {
+
+// The count of significant digits of the shortest text that reads back as `value`; 0 when there is
+// none (not finite).
+int ShortestDigits(double value) {
+    char text[64];
+    const auto [end, error] = std::to_chars(text, text + sizeof text, value);
+    if (error != std::errc()) return 0;
+    int digits = 0;
+    int zeros = 0;  // zeros seen since the last other digit: trailing ones do not count
+    bool leading = true;
+    for (const char* c = text; c != end && *c != 'e'; ++c) {
+        if (*c < '0' || *c > '9') continue;
+        if (*c == '0') {
+            if (!leading) ++zeros;
+            continue;
+        }
+        leading = false;
+        digits += zeros + 1;
+        zeros = 0;
+    }
+    return digits;
+}
+
+}  // namespace
+
 Tcl_Obj* NewDouble(double value) {
     // Whole numbers read as integers; others with the fewest digits that read back the same.
     if (std::isfinite(value) && value == std::round(value) && std::fabs(value) < 1e15)
         return NewInt(static_cast<long long>(std::llround(value)));
+    // The fewest digits that read back the same are those of the shortest form std::to_chars
+    // gives; printed with %g at that precision, the text is the one the search over 1 to 17
+    // digits below finds, at the price of one formatting instead of up to seventeen.
     char buffer[40];
-    for (int digits = 1; digits <= 17; ++digits) {
-        std::snprintf(buffer, sizeof buffer, "%.*g", digits, value);
+    if (const int digits = ShortestDigits(value); digits > 0) {
+        // Formatted as printf's %g would, without its locale and argument list.
+        const auto [end, error] = std::to_chars(buffer, buffer + sizeof buffer, value, std::chars_format::general, digits);
+        double back = 0;
+        if (error == std::errc() && std::from_chars(buffer, end, back).ptr == end && back == value)
+            return Tcl_NewStringObj(buffer, static_cast<int>(end - buffer));
+    }
+    for (int d = 1; d <= 17; ++d) {
+        std::snprintf(buffer, sizeof buffer, "%.*g", d, value);
         if (std::strtod(buffer, nullptr) == value) break;
     }
     return Tcl_NewStringObj(buffer, -1);
