@@ -95,7 +95,9 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
         CommonI::RefCountPtr<IOptionNameIterator> match;
         m_matches->GetIterator(match);
         match->First();
-        m_slots[i] = MakeWord(Port_String("-", match->Current().c_str()), interp);
+        const Port_String name = match->Current();
+        // A name typed in full is its own rewriting: the word stays as it came.
+        m_slots[i] = name == typed ? argv[i] : MakeWord(Port_String("-", name.c_str()), interp);
     }
     return 0;
 }
