@@ -42,16 +42,24 @@ CommonI::RESULT CmdArgMatcher::Match(const Port_String& typed,
         } else if (matches->Clear() != 1) {
             return 0;
         }
-        for (names->First(); !names->IsDone(); names->Next()) {
-            const Port_String name = names->Current();
-            if (!BeginsWith(name, typed)) continue;
+        // One step per candidate: 0 failed, 1 go on, 2 done.
+        auto consider = [&](const Port_String& name) -> int {
+            if (!BeginsWith(name, typed)) return 1;
             if (name.Length() == typed.Length()) {
                 // An exact name is never ambiguous, whatever else begins with it.
                 if (matches->Clear() != 1) return 0;
-                return matches->Add(name) == 1 ? 1 : 0;
+                return matches->Add(name) == 1 ? 2 : 0;
             }
-            if (matches->Add(name) != 1) return 0;
+            return matches->Add(name) == 1 ? 1 : 0;
+        };
+        // This library's own iterator is read in place; any other through copies of its names.
+        if (auto* own = static_cast<IOptionNameIterator*>(names->GetInterface(OwnIteratorID))) {
+            for (const Port_String& name : static_cast<OptionNameIterator*>(own)->Names())
+                if (const int step = consider(name); step != 1) return step == 2 ? 1 : 0;
+            return 1;
         }
+        for (names->First(); !names->IsDone(); names->Next())
+            if (const int step = consider(names->Current()); step != 1) return step == 2 ? 1 : 0;
         return 1;
     } catch (const std::bad_alloc&) {
         return 0;

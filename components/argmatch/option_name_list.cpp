@@ -62,8 +62,14 @@ CitI::IInterface* OptionNameIterator::GetInterface(const Port::XUID& id) {
     if (id == IOptionNameIteratorID || id == CitI::IInterfaceID)
         return static_cast<IOptionNameIterator*>(this);
     if (id == IOptionNameSourceID) return static_cast<IOptionNameSource*>(this);
+    if (id == OwnIteratorID) return static_cast<IOptionNameIterator*>(this);
     if (id == CommonI::IRefCountID) return &m_counter;
     return nullptr;
+}
+
+const NameStore& OptionNameIterator::Names() const noexcept {
+    static const NameStore none;
+    return m_names ? *m_names : none;
 }
 
 Port_String OptionNameIterator::Current() { return IsDone() ? Port_String() : (*m_names)[m_pos]; }

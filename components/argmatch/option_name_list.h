@@ -34,9 +34,17 @@ private:
     std::shared_ptr<NameStore> m_names;  // null while the list has never held a name
 };
 
+// The identifier under which an iterator of this library answers with itself, so that the
+// library's matcher reads its names in place instead of through copies. Not an interface of the
+// system: another library's iterator does not know it and is read through IOptionNameIterator.
+inline constexpr Port::XUIDLiteral OwnIteratorID{0x5b0e7d2c94a14f6eull, 0x8c3f61a0d27b9e45ull};
+
 // Walks a shared store of names; it is also the candidate source that a matcher reads.
 class OptionNameIterator final : public IOptionNameIterator, public IOptionNameSource {
 public:
+    // The names it walks, as they stood when it was made; empty when there are none.
+    const NameStore& Names() const noexcept;
+
     explicit OptionNameIterator(std::shared_ptr<const NameStore> names) noexcept;
     OptionNameIterator(const OptionNameIterator&) = delete;
     OptionNameIterator& operator=(const OptionNameIterator&) = delete;
