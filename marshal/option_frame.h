@@ -113,6 +113,8 @@ struct OptionFrame {
     // Positionals from word 2 on; a tail list takes the word at the last positional place and every
     // word up to `end`.
     static int FetchPositionals(Positionals& positionals, Tcl_Interp* interp, Script::Handle* const* words, int end) {
+        // One allocation for the whole tail instead of one per doubling.
+        if constexpr (kTail) std::get<R - 1>(positionals).reserve(static_cast<size_t>(end - kFirstOption + 1));
         return [&]<size_t... K>(std::index_sequence<K...>) {
             int failed = 0;
             ((failed = failed ? failed : FetchValue(std::get<K>(positionals), interp, words[K + 2], Script::IN)), ...);
