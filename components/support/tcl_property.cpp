@@ -13,8 +13,9 @@ TclProperty::~TclProperty() {
 }
 
 CitI::IInterface* TclProperty::GetInterface(const Port::XUID& id) {
-    if (id == UtilI::ITclPropertyID || id == CitI::IInterfaceID) return this;
+    // The counter first: every counted pointer asks for it on each copy and release.
     if (id == CommonI::IRefCountID) return &m_counter;
+    if (id == UtilI::ITclPropertyID || id == CitI::IInterfaceID) return this;
     return nullptr;
 }
 
