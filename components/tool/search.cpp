@@ -23,6 +23,10 @@ constexpr Kind kAllKinds[] = {Kind::Cell, Kind::Net, Kind::Port, Kind::Clock, Ki
 // would test more than this many (a few seconds of work) is refused with a message rather than run
 // for hours. Sites named outright and globs that no site name can match need no walk at all.
 constexpr long long kMostSitesTested = 10'000'000;
+// Tcl compiles a regular expression in time that grows faster than its length: 4096 characters
+// take a tenth of a second, 65536 a minute and a half. Names are short; longer expressions are
+// refused.
+constexpr std::size_t kLongestExpression = 4096;
 
 // How the sites of a device can match a search text.
 struct SiteSearch {
@@ -97,6 +101,9 @@ public:
         Tcl_RegExp expression = nullptr;
         TclValue pattern(NewText(text.c_str()));
         if (byExpression) {
+            if (text.Length() > static_cast<int32_t>(kLongestExpression))
+                return Fail(message, "a regular expression of at most " + std::to_string(kLongestExpression) +
+                                         " characters is taken, not " + std::to_string(text.Length()));
             const int flags = TCL_REG_ADVANCED | (matchcase ? 0 : TCL_REG_NOCASE);
             expression = Tcl_GetRegExpFromObj(m_state->interp, pattern.get(), flags);
             if (expression == nullptr) {
