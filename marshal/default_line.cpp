@@ -7,9 +7,10 @@
 // does that work directly. It needs the call frame's words, the namespace's resolvers and the
 // variable's record, which only Tcl's internal interface shows; that use stays in this file.
 //
-// A variable that nothing traces, links or resolves takes its new value in place. Any other (a new
-// one, a traced one, an array, a link, one behind a resolver) is declared and set by Tcl's own
-// `variable` and `set` in the namespace's frame, and the caller reads it back, as after the line.
+// A variable that nothing traces, links or resolves takes its new value in place; for a literal
+// default no script runs at all, and no frame is pushed. Any other variable (a new one, a traced
+// one, an array, a link, one behind a resolver) is declared and set by Tcl's own `variable` and
+// `set` in the namespace's frame, and the caller reads it back, as after the line.
 // A default that is not one literal word or one command of literal words runs the line itself.
 #include "marshal/default_line.h"
 
