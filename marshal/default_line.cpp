@@ -36,16 +36,12 @@ Tcl_Obj* Kept(const char* text, int length = -1) {
     return obj;
 }
 
-// The one word of `text` when it is a whole command of one word: its token, or null.
-const Tcl_Token* OneWord(Tcl_Parse& parse, const char* text, int length) {
-    if (Tcl_ParseCommand(nullptr, text, length, 0, &parse) != TCL_OK) return nullptr;
-    const char* end = text + length;
-    const char* after = parse.commandStart + parse.commandSize;
-    if (parse.numWords != 1 || after != end) {
-        Tcl_FreeParse(&parse);
-        return nullptr;
-    }
-    return parse.tokenPtr;
+// Parses `text` as one command that takes all of it; false (and nothing to free) otherwise.
+bool ParseWhole(Tcl_Parse& parse, const char* text, int length) {
+    if (Tcl_ParseCommand(nullptr, text, length, 0, &parse) != TCL_OK) return false;
+    if (parse.numWords > 0 && parse.commandStart + parse.commandSize == text + length) return true;
+    Tcl_FreeParse(&parse);
+    return false;
 }
 
 // The text of a simple word (braced, quoted or bare, without substitutions).
@@ -57,23 +53,21 @@ Tcl_Obj* SimpleWordValue(const Tcl_Token* word) {
 // brackets, gets the command's words. Any other leaves both empty.
 void ParseDefault(DefaultLine& out, const char* text) {
     Tcl_Parse parse;
-    const Tcl_Token* word = OneWord(parse, text, static_cast<int>(std::strlen(text)));
-    if (word == nullptr) return;
-    if (word->type == TCL_TOKEN_SIMPLE_WORD) {
+    if (!ParseWhole(parse, text, static_cast<int>(std::strlen(text)))) return;
+    const Tcl_Token* word = parse.tokenPtr;
+    if (parse.numWords != 1) {
+        // Not one word: the line runs as it is.
+    } else if (word->type == TCL_TOKEN_SIMPLE_WORD) {
         out.literal = SimpleWordValue(word);
     } else if (word->type == TCL_TOKEN_WORD && word->numComponents == 1 && word[1].type == TCL_TOKEN_COMMAND) {
         Tcl_Parse inner;
-        const char* script = word[1].start + 1;
-        const int length = word[1].size - 2;
-        if (Tcl_ParseCommand(nullptr, script, length, 0, &inner) == TCL_OK) {
-            const bool whole = inner.commandStart + inner.commandSize == script + length && inner.numWords > 0;
-            bool simple = whole;
+        if (ParseWhole(inner, word[1].start + 1, word[1].size - 2)) {
+            std::vector<const Tcl_Token*> words;
             const Tcl_Token* token = inner.tokenPtr;
-            for (int i = 0; simple && i < inner.numWords; token += token->numComponents + 1, ++i)
-                simple = token->type == TCL_TOKEN_SIMPLE_WORD;
-            token = inner.tokenPtr;
-            for (int i = 0; simple && i < inner.numWords; token += token->numComponents + 1, ++i)
-                out.command.push_back(SimpleWordValue(token));
+            for (int i = 0; i < inner.numWords; token += token->numComponents + 1, ++i)
+                if (token->type == TCL_TOKEN_SIMPLE_WORD) words.push_back(token);
+            if (static_cast<int>(words.size()) == inner.numWords)
+                for (const Tcl_Token* simple : words) out.command.push_back(SimpleWordValue(simple));
             Tcl_FreeParse(&inner);
         }
     }
