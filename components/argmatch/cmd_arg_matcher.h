@@ -2,12 +2,13 @@
 #pragma once
 
 #include "ArgMatch/ICmdArgMatcher.h"
+#include "Port/Recycle.h"
 
 namespace ArgMatchKit {
 
 // Matches a typed option name against candidates: a candidate equal to the typed name is the only
 // match, otherwise every candidate that begins with the typed name matches.
-class CmdArgMatcher final : public ICmdArgMatcher {
+class CmdArgMatcher final : public ICmdArgMatcher, public Port::Recycled<CmdArgMatcher> {
 public:
     CmdArgMatcher() noexcept;
     ~CmdArgMatcher() override;

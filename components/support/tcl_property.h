@@ -3,6 +3,7 @@
 
 #include <tcl.h>
 
+#include "Port/Recycle.h"
 #include "UtilI/ITclProperty.h"
 
 namespace TcltaskSupport {
@@ -11,7 +12,7 @@ namespace TcltaskSupport {
 // the operation and back to the interpreter's result without a copy or a conversion. A value that
 // was never set is the empty string; "(nil)" and "nil" are ordinary texts here. A property belongs
 // to the thread of the interpreter whose values it holds.
-class TclProperty final : public UtilI::ITclProperty {
+class TclProperty final : public UtilI::ITclProperty, public Port::Recycled<TclProperty> {
 public:
     TclProperty() noexcept;
     ~TclProperty() override;

@@ -1,11 +1,12 @@
 // The portability layer: strings, identifiers, messages, UT_STR, the component factory with its
-// library cache, the instance table and the init objects.
+// library cache, the instance table, the init objects and the recycling of component memory.
 #include <gtest/gtest.h>
 
 #include <cctype>
 #include <cstring>
 #include <functional>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "CitP/Factory.h"
@@ -13,6 +14,7 @@
 #include "CommonI/RefCountPtr.h"
 #include "Port/Init.h"
 #include "Port/MsgData.h"
+#include "Port/Recycle.h"
 #include "Port/StringBase.h"
 #include "Port/UT_STR.h"
 #include "Port/XUID.h"
@@ -575,3 +577,38 @@ TEST(InitObjects, TablesLiveAsLongAsTheirInitObjects) {
 }
 
 }  // namespace
+
+namespace {
+struct Block : Port::Recycled<Block, 2> {
+    virtual ~Block() = default;
+    int payload[4] = {};
+};
+struct Bigger final : Block {
+    int more[8] = {};
+};
+}  // namespace
+
+// The shelf is checked by the addresses it hands out: a block on a shelf is still allocated, so the
+// heap cannot hand it out again by chance.
+TEST(Recycled, BlocksGoBackToTheirOwnThreadUpToTheShelfLength) {
+    if (!Port::kRecycleBlocks) GTEST_SKIP() << "every block goes to the heap under AddressSanitizer";
+    Block* made[3] = {new Block, new Block, new Block};
+    for (Block* block : made) delete block;  // the third finds the shelf full
+    void* onShelf[2] = {made[1], made[0]};
+    void* fromOtherThread = nullptr;
+    std::thread([&] {
+        auto* block = new Block;
+        fromOtherThread = block;
+        delete block;
+    }).join();
+    EXPECT_NE(fromOtherThread, onShelf[0]);
+    EXPECT_NE(fromOtherThread, onShelf[1]);
+    Block* bigger = new Bigger;
+    EXPECT_NE(static_cast<void*>(bigger), onShelf[0]) << "a derived class of another size asks the heap";
+    delete bigger;  // and goes back to it: the shelf still holds the two blocks of this thread
+    Block* again[2] = {new Block, new Block};
+    EXPECT_EQ(static_cast<void*>(again[0]), onShelf[0]) << "the last block given back is taken first";
+    EXPECT_EQ(static_cast<void*>(again[1]), onShelf[1]);
+    EXPECT_EQ(again[0]->payload[0], 0) << "a recycled block is constructed anew";
+    for (Block* block : again) delete block;
+}
