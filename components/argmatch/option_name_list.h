@@ -2,20 +2,55 @@
 #pragma once
 
 #include <cstddef>
-#include <memory>
 #include <vector>
 
 #include "ArgMatch/ICmdArgMatcher.h"
+#include "Port/Recycle.h"
 
 namespace ArgMatchKit {
 
-using NameStore = std::vector<Port_String>;
+class NameStore;
+
+// A counted reference to a store of names. The count is plain, not atomic: a list and its iterators
+// stay on their interpreter's thread. The last reference hands the store back to its thread's pool,
+// emptied but with its room kept, so that the next list of a call takes no memory from the heap.
+class StoreRef {
+public:
+    StoreRef() noexcept = default;
+    StoreRef(const StoreRef& other) noexcept;
+    StoreRef(StoreRef&& other) noexcept : m_store(other.m_store) { other.m_store = nullptr; }
+    StoreRef& operator=(const StoreRef& other) noexcept;
+    StoreRef& operator=(StoreRef&& other) noexcept;
+    ~StoreRef();
+
+    // A store of its own from the pool, empty; null when no memory is left.
+    static StoreRef Fresh() noexcept;
+
+    explicit operator bool() const noexcept { return m_store != nullptr; }
+    NameStore* operator->() const noexcept { return m_store; }
+    NameStore& operator*() const noexcept { return *m_store; }
+    bool Shared() const noexcept;
+    void Reset() noexcept;
+
+private:
+    explicit StoreRef(NameStore* store) noexcept : m_store(store) {}
+    NameStore* m_store = nullptr;
+};
+
+class NameStore {
+public:
+    std::vector<Port_String> names;
+
+private:
+    friend class StoreRef;
+    long m_refs = 0;
+};
 
 // A list of option names in the order they were added. An iterator shares the list's store instead
 // of copying it; a change to a shared store is made on a private copy, so that an iterator always
 // walks the names as they stood when it was made (a matcher may be handed an iterator over the very
 // list it fills). The components belong to the interpreter's thread; nothing here is locked.
-class OptionNameList final : public IOptionNameList {
+class OptionNameList final : public IOptionNameList, public Port::Recycled<OptionNameList> {
 public:
     OptionNameList() noexcept;
     ~OptionNameList() override;
@@ -31,7 +66,7 @@ public:
 
 private:
     CommonI::RefCounter m_counter{this};
-    std::shared_ptr<NameStore> m_names;  // null while the list has never held a name
+    StoreRef m_names;  // null while the list has never held a name
 };
 
 // The identifier under which an iterator of this library answers with itself, so that the
@@ -40,12 +75,14 @@ private:
 inline constexpr Port::XUIDLiteral OwnIteratorID{0x5b0e7d2c94a14f6eull, 0x8c3f61a0d27b9e45ull};
 
 // Walks a shared store of names; it is also the candidate source that a matcher reads.
-class OptionNameIterator final : public IOptionNameIterator, public IOptionNameSource {
+class OptionNameIterator final : public IOptionNameIterator,
+                                 public IOptionNameSource,
+                                 public Port::Recycled<OptionNameIterator> {
 public:
     // The names it walks, as they stood when it was made; empty when there are none.
-    const NameStore& Names() const noexcept;
+    const std::vector<Port_String>& Names() const noexcept;
 
-    explicit OptionNameIterator(std::shared_ptr<const NameStore> names) noexcept;
+    explicit OptionNameIterator(StoreRef names) noexcept;
     OptionNameIterator(const OptionNameIterator&) = delete;
     OptionNameIterator& operator=(const OptionNameIterator&) = delete;
 
@@ -58,7 +95,7 @@ public:
 
 private:
     CommonI::RefCounter m_counter{static_cast<IOptionNameIterator*>(this)};
-    std::shared_ptr<const NameStore> m_names;
+    StoreRef m_names;
     std::size_t m_pos = 0;
 };
 
