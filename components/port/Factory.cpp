@@ -36,7 +36,10 @@ struct LibraryEntry {
     LibraryEntry* next;
 };
 
-std::atomic<ClassEntry*> g_classes{nullptr};
+// The classes, spread over buckets by their identifier, so that a lookup walks a handful of entries
+// however many classes the libraries register.
+constexpr size_t kClassBuckets = 64;
+std::atomic<ClassEntry*> g_classes[kClassBuckets]{};
 std::atomic<LibraryEntry*> g_libraries{nullptr};
 std::atomic<int> g_inits{0};
 std::atomic<int> g_libraryOpens{0};
@@ -62,13 +65,18 @@ void FreeList(std::atomic<Entry*>& head) noexcept {
     }
 }
 
+std::atomic<ClassEntry*>& BucketOf(const Port::XUID& classId) noexcept {
+    const uint64_t mixed = classId.First() ^ (classId.Second() * 0x9e3779b97f4a7c15ull);
+    return g_classes[(mixed >> 58) % kClassBuckets];
+}
+
 void TearDown() noexcept {
-    FreeList(g_classes);
+    for (auto& bucket : g_classes) FreeList(bucket);
     FreeList(g_libraries);
 }
 
 ClassEntry* FindClass(const Port::XUID& classId) noexcept {
-    for (ClassEntry* entry = g_classes.load(std::memory_order_acquire); entry; entry = entry->next) {
+    for (ClassEntry* entry = BucketOf(classId).load(std::memory_order_acquire); entry; entry = entry->next) {
         if (entry->first == classId.First() && entry->second == classId.Second()) return entry;
     }
     return nullptr;
@@ -155,7 +163,7 @@ void Factory::RegisterClass(const Port::XUID& classId, ComponentCreator creator)
         entry->creator.store(creator, std::memory_order_release);
         return;
     }
-    Publish(g_classes, new ClassEntry{classId.First(), classId.Second(), {creator}, nullptr});
+    Publish(BucketOf(classId), new ClassEntry{classId.First(), classId.Second(), {creator}, nullptr});
 }
 
 bool Factory::IsRegistered(const Port::XUID& classId) {
