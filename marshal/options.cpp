@@ -60,9 +60,17 @@ int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count)
     return 0;
 }
 
-Script::Handle* MatchSession::MakeWord(const Port_String& text, Tcl_Interp* interp) {
-    if (m_wordsMade < kInlineWords) return &m_inlineWords[m_wordsMade++].emplace(text.c_str(), interp);
-    m_heapWords.push_back(std::make_unique<Script::TclStringHandle>(text.c_str(), interp));
+Tcl_Obj* OptionWord::GetTclObj() {
+    if (!m_made) {
+        SetObj(Tcl_NewStringObj(m_text.c_str(), m_text.Length()));
+        m_made = true;
+    }
+    return TclObjHandleBase::GetTclObj();
+}
+
+Script::Handle* MatchSession::MakeWord(const Port_String& name) {
+    if (m_wordsMade < kInlineWords) return &m_inlineWords[m_wordsMade++].emplace(name);
+    m_heapWords.push_back(std::make_unique<OptionWord>(name));
     return m_heapWords.back().get();
 }
 
@@ -77,8 +85,7 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
             m_slots[i] = argv[i];
             continue;
         }
-        Port_String typed(text);
-        typed.Trim("-", Port::TrimLeadingOnce);
+        const Port_String typed(text + 1);  // the name without its one leading dash
         CommonI::RefCountPtr<IOptionNameIterator> candidates;
         if (m_valid->GetIterator(candidates) != 1 || !candidates)
             return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
@@ -97,7 +104,7 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
         match->First();
         const Port_String name = match->Current();
         // A name typed in full is its own rewriting: the word stays as it came.
-        m_slots[i] = name == typed ? argv[i] : MakeWord(Port_String("-", name.c_str()), interp);
+        m_slots[i] = name == typed ? argv[i] : MakeWord(name);
     }
     return 0;
 }

@@ -14,6 +14,20 @@
 
 namespace TcltaskI {
 
+// An option word rewritten to the full name of the option it abbreviates. The option walk reads its
+// text; a Tcl value is made only when one is asked for (a word taken as the value of the option
+// before it).
+class OptionWord final : public Script::TclObjHandleBase {
+public:
+    explicit OptionWord(const Port_String& name) { m_text.Append("-", 1).Append(name.c_str(), name.Length()); }
+    Tcl_Obj* GetTclObj() override;
+    const char* GetString() override { return m_text.c_str(); }
+
+private:
+    Port_String m_text;
+    bool m_made = false;
+};
+
 // The matcher, its two name lists and the matched vector of one call. On destruction it gives back
 // the matcher, the list of valid names and the list of matches, in that order, and frees the
 // handles the matching pass made.
@@ -38,7 +52,7 @@ private:
 
     int NoMatch(Tcl_Interp* interp, const Port_String& typed);
     int Ambiguous(Tcl_Interp* interp, const Port_String& typed);
-    Script::Handle* MakeWord(const Port_String& text, Tcl_Interp* interp);
+    Script::Handle* MakeWord(const Port_String& name);
 
     CommonI::RefCountPtr<ICmdArgMatcher> m_matcher;
     CommonI::RefCountPtr<IOptionNameList> m_matches;
@@ -47,9 +61,9 @@ private:
     Script::Handle* m_inlineSlots[kInlineWords];
     std::vector<Script::Handle*> m_heapSlots;
     Script::Handle** m_slots = m_inlineSlots;
-    std::optional<Script::TclStringHandle> m_inlineWords[kInlineWords];
+    std::optional<OptionWord> m_inlineWords[kInlineWords];
     int m_wordsMade = 0;
-    std::vector<std::unique_ptr<Script::TclStringHandle>> m_heapWords;
+    std::vector<std::unique_ptr<OptionWord>> m_heapWords;
 };
 
 // Requests the component libraries that matched and switch methods use (the matcher and the
