@@ -153,7 +153,8 @@ public:
 private:
     static bool Matches(const char* typed, const char* name) {
         if constexpr (Compare == WordCompare::UtStr) return UT_STR::_Compare(typed, name) == 0;
-        else return std::strcmp(typed, name) == 0;
+        // The first byte settles most rows without a call.
+        else return typed[0] == name[0] && std::strcmp(typed, name) == 0;
     }
 
     Script::TScriptHandleHelper<W> m_helper;
