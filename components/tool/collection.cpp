@@ -42,13 +42,15 @@ public:
 
     CommonI::RESULT equal(const Prop& a, const Prop& b, bool order_dependent, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        std::vector<std::string> left, right;
-        if (!Resolve(a, left, message) || !Resolve(b, right, message)) return 0;
-        if (!order_dependent) {
-            std::sort(left.begin(), left.end());
-            std::sort(right.begin(), right.end());
-        }
-        return Answer(NewBool(left == right), result, message);
+        std::vector<std::string> ownLeft, ownRight;
+        const std::vector<std::string>* left = View(a, ownLeft, message);
+        const std::vector<std::string>* right = left ? View(b, ownRight, message) : nullptr;
+        if (right == nullptr) return 0;
+        if (order_dependent) return Answer(NewBool(*left == *right), result, message);
+        std::vector<std::string> sortedLeft(*left), sortedRight(*right);
+        std::sort(sortedLeft.begin(), sortedLeft.end());
+        std::sort(sortedRight.begin(), sortedRight.end());
+        return Answer(NewBool(sortedLeft == sortedRight), result, message);
     }
 
     CommonI::RESULT copy(const Prop& collection, Out& result, Msg& message) override {
@@ -162,12 +164,21 @@ private:
         return true;
     }
 
-    bool Resolve(const Prop& value, std::vector<std::string>& names, Msg& message) const {
+    // The names that a property stands for (see ResolveView); null after the failure is set.
+    const std::vector<std::string>* View(const Prop& value, std::vector<std::string>& own, Msg& message) const {
         std::string error;
         TclValue v = ValueOf(value);
         if (!v) v = TclValue(NewText(""));
-        if (ResolveObjects(*m_state, v.get(), names, error)) return true;
-        return Fail(message, error);
+        const std::vector<std::string>* names = ResolveView(*m_state, v.get(), own, error);
+        if (names == nullptr) Fail(message, error);
+        return names;
+    }
+
+    bool Resolve(const Prop& value, std::vector<std::string>& names, Msg& message) const {
+        const std::vector<std::string>* found = View(value, names, message);
+        if (found == nullptr) return false;
+        if (found != &names) names = *found;
+        return true;
     }
 
     bool ResolveAll(const List& items, std::vector<std::string>& names, Msg& message) const {

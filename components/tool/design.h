@@ -272,7 +272,7 @@ struct ToolState {
     SettingTable highlightSettings;
     std::vector<std::string> selection;             // in the order of selecting
     SettingTable selectionSettings;
-    std::map<std::string, std::vector<std::string>> collections;
+    std::map<std::string, std::vector<std::string>, std::less<>> collections;
 
     // Filled by the timing analysis and the floorplan in their own files.
     std::shared_ptr<TimingData> timing;
@@ -291,6 +291,10 @@ StatePtr StateOf(Tcl_Interp* interp);
 // Resolves a collection value: the name of a collection, or a list of object names of the current
 // design. False with `error` set when a name is unknown or no project is open.
 bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& names, std::string& error);
+// The same names without a copy: the collection's own list when the value names one, else `own`
+// filled; null after setting `error`. The list stays valid until the collections change.
+const std::vector<std::string>* ResolveView(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& own,
+                                            std::string& error);
 
 // The text every design operation fails with when no project is open.
 inline constexpr const char* kNoProject = "no project is open: open one with projmgr Open FILE msgVar";

@@ -91,7 +91,8 @@ Tcl_Obj* DictBuilder::Take() noexcept { return std::exchange(m_dict, Tcl_NewList
 
 UtilI::MITclProperty MakeProperty(Tcl_Obj* value, Port_String& message) {
     TclValue hold(value);  // frees a value without references on every way out
-    if (!CitP::Factory::LoadLibraryFactory("libTcltask_Support")) {
+    static const Port_String kSupport("libTcltask_Support");
+    if (!CitP::Factory::LoadLibraryFactory(kSupport)) {
         message = "the property component library libTcltask_Support cannot be loaded";
         return {};
     }

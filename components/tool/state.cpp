@@ -77,35 +77,40 @@ bool Alive(const ToolState& state, Port_String& message) {
     return state.interp != nullptr || Fail(message, kStateGone) != 0;
 }
 
-bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& names, std::string& error) {
+const std::vector<std::string>* ResolveView(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& own,
+                                            std::string& error) {
     const Design* design = state.CurrentDesign();
     if (design == nullptr) {
         error = kNoProject;
-        return false;
+        return nullptr;
     }
-    names.clear();
+    own.clear();
     const char* whole = Tcl_GetString(value);
-    if (auto it = state.collections.find(whole); it != state.collections.end()) {
-        names = it->second;
-        return true;
-    }
+    if (auto it = state.collections.find(std::string_view(whole)); it != state.collections.end()) return &it->second;
     int count = 0;
     Tcl_Obj** items = nullptr;
     if (Tcl_ListObjGetElements(nullptr, value, &count, &items) != TCL_OK) {
         error = std::string("'") + whole + "' is neither a collection nor a list of objects";
-        return false;
+        return nullptr;
     }
     for (int i = 0; i < count; ++i) {
-        std::string word = Tcl_GetString(items[i]);
+        const std::string_view word = Tcl_GetString(items[i]);
         if (auto it = state.collections.find(word); it != state.collections.end()) {
-            names.insert(names.end(), it->second.begin(), it->second.end());
+            own.insert(own.end(), it->second.begin(), it->second.end());
         } else if (design->Find(word)) {
-            names.push_back(std::move(word));
+            own.emplace_back(word);
         } else {
-            error = "unknown object '" + word + "'";
-            return false;
+            error = "unknown object '" + std::string(word) + "'";
+            return nullptr;
         }
     }
+    return &own;
+}
+
+bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& names, std::string& error) {
+    const std::vector<std::string>* found = ResolveView(state, value, names, error);
+    if (found == nullptr) return false;
+    if (found != &names) names = *found;
     return true;
 }
 
