@@ -22,11 +22,9 @@ Tcl_Obj* PropertyText(UtilI::ITclProperty* property) {
     Port_String message;
     if (property->ToTclObj(value, message) != 1 || !value)
         return Tcl_NewStringObj((std::string("<unreadable: ") + message.c_str() + ">").c_str(), -1);
-    // A property may hand out a value it holds or a fresh one; the text is copied either way.
-    TclRef held(value);
-    int length = 0;
-    const char* text = Tcl_GetStringFromObj(held.get(), &length);
-    return Tcl_NewStringObj(text, length);
+    // The record shares the value: with the record's reference it is shared, and Tcl never changes
+    // a shared value in place.
+    return value;
 }
 
 }  // namespace

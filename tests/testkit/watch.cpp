@@ -4,6 +4,7 @@
 #include <cstring>
 #include <mutex>
 #include <set>
+#include <thread>
 #include <vector>
 
 #include "ArgMatch/ICmdArgMatcher.h"
@@ -36,10 +37,23 @@ struct Event {
     std::string detail;
 };
 
+// Held only for a push, a swap or a look-up, never across a call out of the kit: a spin costs less
+// than a mutex on the death of every component of every call.
+class SpinLock {
+public:
+    void lock() noexcept {
+        while (m_held.test_and_set(std::memory_order_acquire)) std::this_thread::yield();
+    }
+    void unlock() noexcept { m_held.clear(std::memory_order_release); }
+
+private:
+    std::atomic_flag m_held;
+};
+
 // Kept for the process: components may die during static teardown and still report. Components
 // die on every interpreter thread, hence the lock.
 struct State {
-    std::mutex lock;
+    SpinLock lock;
     std::vector<Event> events;
     std::set<std::string> faults;
     std::atomic<bool> anyFault{false};  // lets the factory's filters answer without the lock
