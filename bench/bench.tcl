@@ -96,8 +96,8 @@ proc bench::Setup {} {
     set ::plainview [PlainView new]
     # The tool's root commands, with the sample design open and a collection x of its registers.
     kelmartool::open [file join [file dirname $here] examples designs counter.json]
-    set ::tcoll collection
-    set ::tview view
+    set ::tcoll ::kelmartool::collection
+    set ::tview ::kelmartool::view
     $::tcoll set x {r0 r1}
 
     Case native "native limit" {$native x}

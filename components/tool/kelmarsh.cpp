@@ -2,8 +2,9 @@
 //
 //   kelmarsh ?-project FILE? ?script.tcl? ?arg ...?
 //
-// Loads the tool package from the lib folder beside the shell's bin folder, opens FILE as the
-// current project when given, then runs the script, or reads commands at a prompt.
+// Loads the tool package from the lib folder beside the shell's bin folder, imports its root
+// commands and makes `help`, opens FILE as the current project when given, then runs the script,
+// or reads commands at a prompt.
 #include <tcl.h>
 
 #include <cstdio>
@@ -44,9 +45,24 @@ void RunScript(Tcl_Interp* interp) {
 
 int AppInit(Tcl_Interp* interp) {
     if (Tcl_Init(interp) != TCL_OK) return TCL_ERROR;
+    // The tool keeps its roots in ::kelmartool; the shell imports them one by one, so that a name
+    // taken already (by a package on the path, say) costs that name alone, and says so. `help` is
+    // what the package's wrong-count messages ask for.
     static const char* const kSetup =
         "lappend ::auto_path [file join [file dirname [file dirname [file normalize [info nameofexecutable]]]] lib]\n"
         "package require KelmarTool\n"
+        "apply {{} {\n"
+        "    foreach root [namespace eval ::kelmartool {namespace export}] {\n"
+        "        if {[catch {namespace import ::kelmartool::$root} why]} {\n"
+        "            puts stderr \"kelmarsh: $root is not imported: $why; use ::kelmartool::$root\"\n"
+        "        }\n"
+        "    }\n"
+        "    if {[info commands ::help] eq {}} {\n"
+        "        interp alias {} ::help {} ::kelmartool::help\n"
+        "    } else {\n"
+        "        puts stderr \"kelmarsh: help is not made: a command of that name exists; use ::kelmartool::help\"\n"
+        "    }\n"
+        "}}\n"
         "set ::tcl_prompt1 {puts -nonewline \"kelmarsh% \"; flush stdout}\n";
     if (Tcl_Eval(interp, kSetup) != TCL_OK) {
         std::fprintf(stderr, "kelmarsh: %s\n", Tcl_GetStringResult(interp));

@@ -1,7 +1,9 @@
 // Brings the tool up in an interpreter: its state, the root object commands (projmgr, project,
 // collection, settings, obj, view, highlight, selection, search, timing, floorplan) and the
-// convenience commands kelmartool::open and kelmartool::help, which is also `help` unless the
-// interpreter has a help of its own.
+// convenience commands kelmartool::open and kelmartool::help, all in the namespace ::kelmartool.
+// Loading creates no global command: a root word such as `selection` may already be a command of
+// the interpreter (Tk's). The roots, and only they, are exported, so that
+// `namespace import ::kelmartool::*` brings them in and Tcl refuses to replace a command that exists.
 #include <tcl.h>
 
 #include <cstring>
@@ -41,8 +43,10 @@ void DeleteState(ClientData data, Tcl_Interp*) {
     delete state;
 }
 
-// Hands `object` to Tcl under its interface and makes `root` an alias of the wrapper's word.
-// The wrapper takes its own reference; the one held here goes at the end.
+constexpr const char* kToolNamespace = "::kelmartool";
+
+// Hands `object` to Tcl under its interface and makes ::kelmartool::`root` an alias of the
+// wrapper's word. The wrapper takes its own reference; the one held here goes at the end.
 bool Publish(Tcl_Interp* interp, const char* root, const Port::XUID& id, CitI::IInterface* made) {
     CitI::MIInterface object(made);
     CitI::IInterface* wrapped = Script::TclWrapFactory::CreateInstance(id, object.get(), interp);
@@ -53,7 +57,8 @@ bool Publish(Tcl_Interp* interp, const char* root, const Port::XUID& id, CitI::I
     }
     Tcl_Obj* word = Tcl_GetObjResult(interp);
     Tcl_IncrRefCount(word);
-    const bool made_alias = Tcl_CreateAlias(interp, root, interp, Tcl_GetString(word), 0, nullptr) == TCL_OK;
+    const std::string name = std::string(kToolNamespace) + "::" + root;
+    const bool made_alias = Tcl_CreateAlias(interp, name.c_str(), interp, Tcl_GetString(word), 0, nullptr) == TCL_OK;
     Tcl_DecrRefCount(word);
     Tcl_ResetResult(interp);
     return made_alias;
@@ -122,7 +127,7 @@ Tcl_Obj* UnknownHelpWord(const char* word) {
                          word, roots.c_str(), interfaces.c_str());
 }
 
-// help ?ROOT? ?WORD?, also kelmartool::help: the root words with what they are, the command words of
+// kelmartool::help ?ROOT? ?WORD?: the root words with what they are, the command words of
 // one root or object, or the usage of one command word; the same texts a wrong call shows.
 int HelpCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
     if (objc > 3) {
@@ -185,11 +190,15 @@ extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp
         Publish(interp, "floorplan", TcltaskI::IXFloorplanID, NewFloorplan(state));
     if (!published) return TCL_ERROR;
 
+    // The export list is the roots and nothing else, whatever a script put there before.
+    Tcl_Namespace* space = Tcl_FindNamespace(interp, kToolNamespace, nullptr, TCL_LEAVE_ERR_MSG);
+    if (space == nullptr) return TCL_ERROR;
+    for (const Root& root : kRoots)
+        if (Tcl_Export(interp, space, root.word, &root == kRoots) != TCL_OK) return TCL_ERROR;
+
+    // Not exported: the package's wrong-count messages ask for `help`, which is the shell's to
+    // make (kelmarsh makes it an alias of kelmartool::help).
     Tcl_CreateObjCommand(interp, "::kelmartool::open", OpenCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::help", HelpCommand, nullptr, nullptr);
-    // The wrong-count messages of the package ask for `help`; a help of the interpreter's own stays.
-    Tcl_CmdInfo existing;
-    if (Tcl_GetCommandInfo(interp, "::help", &existing) == 0)
-        Tcl_CreateObjCommand(interp, "::help", HelpCommand, nullptr, nullptr);
     return TCL_OK;
 }

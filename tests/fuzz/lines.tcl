@@ -452,10 +452,10 @@ proc fz::spawn {file} {
     lappend ::fz::kids $kid
     $kid eval [list array set ::W [array get ::W]]
     $kid eval [list lappend ::auto_path {*}$::auto_path]
-    $kid eval {package require TcltaskI_TestKit; package require KelmarTool}
+    $kid eval {package require TcltaskI_TestKit; package require KelmarTool; namespace import ::kelmartool::*}
     catch {$kid eval [list projmgr Open $file msg]}
     set made [$kid eval {
-        set made [lmap {root summary} [kelmartool::help] { interp alias {} $root }]
+        set made [lmap {root summary} [kelmartool::help] { interp alias {} ::kelmartool::$root }]
         lappend made [project GetHDProject] [project GetProjectHelper] [testkit::new ICollection] \
             [testkit::new ITclProject]
     }]
@@ -555,6 +555,7 @@ proc fz::setup {samples} {
     }
     package require TcltaskI_TestKit
     package require KelmarTool
+    namespace eval :: {namespace import ::kelmartool::*}
     tables $designs [lmap sample $samples { file tail $sample }]
     usages
     array set ::arr {k v}
@@ -568,7 +569,7 @@ proc fz::setup {samples} {
     set tool {}
     set roots {}
     foreach {root summary} [kelmartool::help] {
-        set word [interp alias {} $root]
+        set word [interp alias {} ::kelmartool::$root]
         dict set tool $root [dict create command $root words [kelmartool::help $root] class [classOf $word]]
         lappend roots $word
     }

@@ -1,5 +1,7 @@
 # Shared by the tool tests: a small design written into a temporary file, and a clean slate.
+# The tests call the roots by their words, as in kelmarsh.
 package require KelmarTool
+namespace import ::kelmartool::*
 
 namespace eval tooltest {
     variable files {}
