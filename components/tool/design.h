@@ -174,13 +174,27 @@ private:
     std::map<std::string, ObjectRef, std::less<>> m_index;
 };
 
-// JSON (design_io.cpp). Read gives the design or leaves `error` saying why, with the file name.
-std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error);
+// JSON (design_io.cpp). Read gives the design and `text`, the file's content, or leaves `error`
+// saying why, with the file name.
+std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& text, std::string& error);
 std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error);
-// Write formats the whole design first and then replaces the file at once (file_io.h); on any
-// failure the file is as it was and `error` names the file and why.
-bool WriteDesign(const Design& design, const std::string& file, std::string& error);
-// The JSON text of a design; false with `error` naming the first field that cannot be written.
+
+// What a write of a design did to its file.
+struct DesignWrite {
+    std::string text;         // the file's content now
+    std::size_t changed = 0;  // values of the former text that were changed, added or removed
+    bool written = false;     // false when the file held the text already and was left alone
+};
+// Writes `design` into `file`, whose content when it was last read or written is `source`. Only
+// the values that differ from what `source` holds are changed, in place (json_edit.h): the layout,
+// the order of the keys and the fields the tool does not know stay as they were, and a design that
+// did not change gives `source` again. An empty `source` gives the whole design, formatted anew.
+// The text is made first and then replaces the file at once (file_io.h), unless the file holds it
+// already; on any failure the file is as it was and `error` names the file and why.
+bool WriteDesign(const Design& design, const std::string& file, const std::string& source, DesignWrite& done,
+                 std::string& error);
+// The JSON text of a design, formatted whole; false with `error` naming the first field that
+// cannot be written.
 bool FormatDesign(const Design& design, std::string& text, std::string& error);
 
 // ---------------------------------------------------------------------------------------------

@@ -23,6 +23,7 @@
 
 #include "design.h"
 #include "file_io.h"
+#include "json_edit.h"
 
 namespace kelmartool {
 
@@ -410,19 +411,24 @@ std::unique_ptr<Design> ParseDesign(const std::string& text, std::string& error)
     return nullptr;
 }
 
-std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& error) {
-    std::string text, why;
-    if (!ReadTextFile(file, text, why)) {
+std::unique_ptr<Design> ReadDesign(const std::string& file, std::string& text, std::string& error) {
+    std::string content, why;
+    if (!ReadTextFile(file, content, why)) {
         error = "cannot read the project file '" + file + "': " + why;
         return nullptr;
     }
     std::string problem;
-    auto design = ParseDesign(text, problem);
+    auto design = ParseDesign(content, problem);
     if (!design) error = "the project file '" + file + "' is malformed: " + problem;
+    else text = std::move(content);
     return design;
 }
 
-bool FormatDesign(const Design& d, std::string& text, std::string& error) {
+namespace {
+
+// The design as the tree the file holds: every field in the order of the file's description above,
+// defaults left out where the reader fills them in.
+ordered_json Tree(const Design& d) {
     ordered_json root = ordered_json::object();
     root["design"] = d.name;
     ordered_json device = ordered_json::object();
@@ -474,10 +480,15 @@ bool FormatDesign(const Design& d, std::string& text, std::string& error) {
         root["floorplan"] = std::move(plan);
     }
     if (!d.properties.empty()) root["properties"] = PropsJson(d.properties);
+    return root;
+}
+
+// The text of `wanted` made whole, two spaces an indentation level.
+bool WholeText(const ordered_json& wanted, std::string& text, std::string& error) {
     // Checked before the dump, which would throw on the first bad byte without saying where.
-    if (error = Unwritable(root, ""); !error.empty()) return false;
+    if (error = Unwritable(wanted, ""); !error.empty()) return false;
     try {
-        text = root.dump(2) + "\n";
+        text = wanted.dump(2) + "\n";
     } catch (const std::exception& e) {
         error = e.what();
         return false;
@@ -485,13 +496,48 @@ bool FormatDesign(const Design& d, std::string& text, std::string& error) {
     return true;
 }
 
-bool WriteDesign(const Design& design, const std::string& file, std::string& error) {
-    std::string text, why;
-    if (!FormatDesign(design, text, why) || !WriteTextFile(file, text, why)) {
-        error = "cannot write the project file '" + file + "': " + why;
+// The text of `design` made from `source`, the text it was read from, by changing in place only
+// the values that differ (json_edit.h). The result is read back: should it not give the design,
+// the design is written whole instead, for a file that holds the design comes before its layout.
+bool EditedText(const std::string& source, const Design& design, DesignWrite& done, std::string& error) {
+    const ordered_json wanted = Tree(design);
+    if (error = Unwritable(wanted, ""); !error.empty()) return false;
+    std::string problem;
+    const auto before = ParseDesign(source, problem);
+    if (!before) {
+        error = "its former text cannot be read again: " + problem;
         return false;
     }
-    return true;
+    try {
+        done.changed = EditJson(source, Tree(*before), wanted, done.text);
+    } catch (const std::exception& e) {
+        error = e.what();
+        return false;
+    }
+    const auto back = ParseDesign(done.text, problem);
+    return (back && Tree(*back) == wanted) || WholeText(wanted, done.text, error);
+}
+
+}  // namespace
+
+bool FormatDesign(const Design& d, std::string& text, std::string& error) { return WholeText(Tree(d), text, error); }
+
+bool WriteDesign(const Design& design, const std::string& file, const std::string& source, DesignWrite& done,
+                 std::string& error) {
+    DesignWrite made;
+    std::string why, current;
+    const bool formatted =
+        source.empty() ? FormatDesign(design, made.text, why) : EditedText(source, design, made, why);
+    if (formatted) {
+        // A file that holds the text already is left alone, its time of change included.
+        made.written = !ReadTextFile(file, current, why) || current != made.text;
+        if (!made.written || WriteTextFile(file, made.text, why)) {
+            done = std::move(made);
+            return true;
+        }
+    }
+    error = "cannot write the project file '" + file + "': " + why;
+    return false;
 }
 
 }  // namespace kelmartool

@@ -178,9 +178,11 @@ public:
         return m_state.On(message, [&](ToolState& state) -> RESULT {
             FloorplanData& plan = Plan(state);
             if (!plan.open) return Fail(message, kNotOpen);
-            std::string file;
-            if (!nosave && !Commit(state, file, message)) return 0;
-            if (!Answer(DictBuilder().Add("saved", !nosave).Add("file", file).Take(), result, message)) return 0;
+            Saved saved;
+            if (!nosave && !Commit(state, saved, message)) return 0;
+            if (!Answer(DictBuilder().Add("saved", !nosave).Add("file", saved.file).Add("changed", saved.changed).Take(),
+                        result, message))
+                return 0;
             plan = FloorplanData{};
             return 1;
         });
@@ -188,9 +190,9 @@ public:
 
     RESULT save(Out& result, Msg& message) override {
         return m_state.On(message, [&](ToolState& state) -> RESULT {
-            std::string file;
-            if (!Commit(state, file, message)) return 0;
-            return Answer(NewText(file), result, message);
+            Saved saved;
+            if (!Commit(state, saved, message)) return 0;
+            return Answer(DictBuilder().Add("file", saved.file).Add("changed", saved.changed).Take(), result, message);
         });
     }
 
@@ -626,9 +628,15 @@ private:
         return 1;
     }
 
+    // What a save wrote: the project file and the number of its values changed, added or removed.
+    struct Saved {
+        std::string file;
+        std::size_t changed = 0;
+    };
+
     // Writes the design with the working copy in it to the project file, and then makes it the
     // project's design; on any failure the file, the design and the floorplan are as they were.
-    static bool Commit(ToolState& state, std::string& file, Msg& message) {
+    static bool Commit(ToolState& state, Saved& saved, Msg& message) {
         FloorplanData* plan = Ready(state, message);
         if (!plan) return false;
         ProjectComponent* project = state.Current();
@@ -659,9 +667,9 @@ private:
         else
             design.properties.erase(kClockLimitKey);
         std::string problem = design.Index();
-        if (problem.empty()) project->Store(std::move(design), problem);
+        if (problem.empty()) project->Store(std::move(design), saved.changed, problem);
         if (!problem.empty()) return Fail(message, "the floorplan cannot be saved: " + problem) != 0;
-        file = project->File();
+        saved.file = project->File();
         if (moved) state.DesignChanged();
         plan->epoch = state.designEpoch;
         plan->modified = false;

@@ -41,10 +41,11 @@ bool ProjectComponent::IsCurrent() const {
 CommonI::RESULT ProjectComponent::OpenWithHelper(const Port_String& file, Dpm::IProjectHelper* helper,
                                                  Port_String& message) {
     if (file.IsEmpty()) return Fail(message, "no project file given");
-    std::string error;
-    auto design = ReadDesign(file.c_str(), error);
+    std::string error, text;
+    auto design = ReadDesign(file.c_str(), text, error);
     if (!design) return Fail(message, error);
     m_file = NormalFile(file.c_str());
+    m_text = std::move(text);
     m_helperName = helper != nullptr ? helper->GetName().c_str() : "";
     m_design = std::move(design);
     message = ("opened " + Summary(*m_design)).c_str();
@@ -61,6 +62,7 @@ CommonI::RESULT ProjectComponent::OpenWithHelper(const Port_String& file, Dpm::I
 
 void ProjectComponent::Drop() {
     m_design.reset();
+    m_text.clear();
     m_components.clear();
     if (auto state = m_state.lock()) {
         const bool wasCurrent = IsCurrent();
@@ -84,27 +86,33 @@ CommonI::RESULT ProjectComponent::Close() {
 CommonI::RESULT ProjectComponent::Sync(Port_String& message) {
     if (!IsOpen()) return Fail(message, kNoProject);
     std::string error;
-    if (!WriteDesign(*m_design, m_file, error)) return Fail(message, error);
-    message = ("wrote " + m_file).c_str();
+    DesignWrite done;
+    if (!WriteDesign(*m_design, m_file, m_text, done, error)) return Fail(message, error);
+    m_text = std::move(done.text);
+    message = (done.written ? "wrote " + m_file : "nothing to write: " + m_file + " holds the design").c_str();
     return 1;
 }
 
-bool ProjectComponent::Store(Design design, std::string& error) {
+bool ProjectComponent::Store(Design design, std::size_t& changed, std::string& error) {
     if (!IsOpen()) {
         error = kNoProject;
         return false;
     }
-    if (!WriteDesign(design, m_file, error)) return false;
+    DesignWrite done;
+    if (!WriteDesign(design, m_file, m_text, done, error)) return false;
     *m_design = std::move(design);
+    m_text = std::move(done.text);
+    changed = done.changed;
     return true;
 }
 
 CommonI::RESULT ProjectComponent::Reload(Port_String& message) {
     if (!IsOpen()) return Fail(message, kNoProject);
-    std::string error;
-    auto design = ReadDesign(m_file, error);
+    std::string error, text;
+    auto design = ReadDesign(m_file, text, error);
     if (!design) return Fail(message, error);  // the design in memory stays as it was
     m_design = std::move(design);
+    m_text = std::move(text);
     message = ("reloaded " + Summary(*m_design)).c_str();
     if (IsCurrent())
         if (auto state = m_state.lock()) state->DesignChanged();

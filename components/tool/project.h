@@ -36,9 +36,10 @@ public:
     Design* GetDesign() const noexcept { return m_design.get(); }
     const std::string& File() const noexcept { return m_file; }
     const std::string& HelperName() const noexcept { return m_helperName; }
-    // Writes `design` to the project file and makes it the project's design; on failure neither
-    // the file nor the design in memory changes, and `error` says why.
-    bool Store(Design design, std::string& error);
+    // Writes `design` to the project file, changing the values that differ from the file's text
+    // (WriteDesign), and makes it the project's design; `changed` is the number of values changed.
+    // On failure neither the file nor the design in memory changes, and `error` says why.
+    bool Store(Design design, std::size_t& changed, std::string& error);
     // Drops the design and the registered components; the project leaves the open list.
     void Drop();
 
@@ -49,6 +50,7 @@ private:
     std::string m_file;
     std::string m_helperName;
     std::unique_ptr<Design> m_design;
+    std::string m_text;  // the file's content when it was last read or written: what a write changes
     std::map<std::pair<uint64_t, uint64_t>, CitI::MIInterface> m_components;
 };
 
