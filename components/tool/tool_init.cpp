@@ -6,10 +6,12 @@
 // `namespace import ::kelmartool::*` brings them in and Tcl refuses to replace a command that exists.
 #include <tcl.h>
 
+#include <algorithm>
 #include <cstring>
 #include <exception>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "CitI/IScriptHandle.h"
 #include "Port/Init.h"
@@ -45,7 +47,50 @@ void DeleteState(ClientData data, Tcl_Interp*) {
 
 constexpr const char* kToolNamespace = "::kelmartool";
 
-// Hands `object` to Tcl under its interface and makes ::kelmartool::`root` an alias of the
+// A root command: ::kelmartool::`root` runs its object's command, the word held here, as an alias
+// would, without the alias's second trip through the interpreter (a sixth of a tool call). While the
+// word names the object command it was made for, the command's procedure is called directly, with
+// the word in place of the root's name; once a script has deleted or replaced that command, the
+// word is evaluated as an alias evaluates its target, with the same errors.
+struct RootTarget {
+    Tcl_Obj* word;            // the object's command word, with a reference
+    Tcl_ObjCmdProc* native;   // the procedure of that command when the root was made
+};
+
+void DeleteRootTarget(ClientData data) {
+    auto* target = static_cast<RootTarget*>(data);
+    Tcl_DecrRefCount(target->word);
+    delete target;
+}
+
+int RootCommand(ClientData data, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
+    const auto* target = static_cast<const RootTarget*>(data);
+    constexpr int kInline = 16;
+    Tcl_Obj* inlineWords[kInline];
+    std::vector<Tcl_Obj*> heapWords;
+    Tcl_Obj** words = inlineWords;
+    if (objc > kInline) {
+        heapWords.resize(static_cast<std::size_t>(objc));
+        words = heapWords.data();
+    }
+    words[0] = target->word;
+    std::copy(objv + 1, objv + objc, words + 1);
+    Tcl_CmdInfo info;
+    const Tcl_Command command = Tcl_GetCommandFromObj(interp, target->word);
+    if (command != nullptr && Tcl_GetCommandInfoFromToken(command, &info) && info.objProc == target->native)
+        return info.objProc(info.objClientData, interp, objc, words);
+    return Tcl_EvalObjv(interp, objc, words, TCL_EVAL_INVOKE);
+}
+
+// The object command word of a root, or null.
+Tcl_Obj* RootWord(Tcl_Interp* interp, const char* root) {
+    const std::string name = std::string(kToolNamespace) + "::" + root;
+    Tcl_CmdInfo info;
+    if (!Tcl_GetCommandInfo(interp, name.c_str(), &info) || info.objProc != &RootCommand) return nullptr;
+    return static_cast<const RootTarget*>(info.objClientData)->word;
+}
+
+// Hands `object` to Tcl under its interface and makes ::kelmartool::`root` the root command of the
 // wrapper's word. The wrapper takes its own reference; the one held here goes at the end.
 bool Publish(Tcl_Interp* interp, const char* root, const Port::XUID& id, CitI::IInterface* made) {
     CitI::MIInterface object(made);
@@ -55,13 +100,18 @@ bool Publish(Tcl_Interp* interp, const char* root, const Port::XUID& id, CitI::I
         Tcl_SetObjResult(interp, Tcl_ObjPrintf("cannot hand the %s object to Tcl: is TcltaskI_Morvane loaded?", root));
         return false;
     }
-    Tcl_Obj* word = Tcl_GetObjResult(interp);
+    Tcl_Obj* word = Tcl_DuplicateObj(Tcl_GetObjResult(interp));
     Tcl_IncrRefCount(word);
-    const std::string name = std::string(kToolNamespace) + "::" + root;
-    const bool made_alias = Tcl_CreateAlias(interp, name.c_str(), interp, Tcl_GetString(word), 0, nullptr) == TCL_OK;
-    Tcl_DecrRefCount(word);
     Tcl_ResetResult(interp);
-    return made_alias;
+    Tcl_CmdInfo info;
+    if (!Tcl_GetCommandInfo(interp, Tcl_GetString(word), &info)) {
+        Tcl_SetObjResult(interp, Tcl_ObjPrintf("the %s object has no command \"%s\"", root, Tcl_GetString(word)));
+        Tcl_DecrRefCount(word);
+        return false;
+    }
+    const std::string name = std::string(kToolNamespace) + "::" + root;
+    Tcl_CreateObjCommand(interp, name.c_str(), RootCommand, new RootTarget{word, info.objProc}, DeleteRootTarget);
+    return true;
 }
 
 // kelmartool::open FILE: opens a design file as the current project; the message on success.
@@ -156,6 +206,25 @@ int HelpCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[])
     return TCL_OK;
 }
 
+// kelmartool::object ROOT: the command word of a root's object (`::kelmar::ICollection3` for
+// collection), the word that wrong-count messages and help name.
+int ObjectCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
+    if (objc != 2) {
+        Tcl_WrongNumArgs(interp, 1, objv, "root");
+        return TCL_ERROR;
+    }
+    const char* root = Tcl_GetString(objv[1]);
+    bool known = false;
+    for (const Root& each : kRoots) known = known || std::strcmp(each.word, root) == 0;
+    Tcl_Obj* word = known ? RootWord(interp, root) : nullptr;
+    if (word == nullptr) {
+        Tcl_SetObjResult(interp, Tcl_ObjPrintf("\"%s\" is no root command of the tool in this interpreter", root));
+        return TCL_ERROR;
+    }
+    Tcl_SetObjResult(interp, word);
+    return TCL_OK;
+}
+
 }  // namespace
 
 namespace kelmartool {
@@ -200,5 +269,6 @@ extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp
     // make (kelmarsh makes it an alias of kelmartool::help).
     Tcl_CreateObjCommand(interp, "::kelmartool::open", OpenCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::help", HelpCommand, nullptr, nullptr);
+    Tcl_CreateObjCommand(interp, "::kelmartool::object", ObjectCommand, nullptr, nullptr);
     return TCL_OK;
 }

@@ -158,7 +158,7 @@ proc fz::guarded {row words} {
 proc fz::usages {} {
     variable usages {}
     foreach {root summary} [kelmartool::help] {
-        set class [classOf [interp alias {} $root]]
+        set class [classOf [kelmartool::object $root]]
         dict set usages $class GetInterface {IFACE {}}
         foreach row [kelmartool::help $root] {
             set text [lindex [split [string map {"Usage: " ""} [kelmartool::help $root $row]] :] 0]
@@ -455,7 +455,7 @@ proc fz::spawn {file} {
     $kid eval {package require TcltaskI_TestKit; package require KelmarTool; namespace import ::kelmartool::*}
     catch {$kid eval [list projmgr Open $file msg]}
     set made [$kid eval {
-        set made [lmap {root summary} [kelmartool::help] { interp alias {} ::kelmartool::$root }]
+        set made [lmap {root summary} [kelmartool::help] { kelmartool::object $root }]
         lappend made [project GetHDProject] [project GetProjectHelper] [testkit::new ICollection] \
             [testkit::new ITclProject]
     }]
@@ -569,7 +569,7 @@ proc fz::setup {samples} {
     set tool {}
     set roots {}
     foreach {root summary} [kelmartool::help] {
-        set word [interp alias {} ::kelmartool::$root]
+        set word [kelmartool::object $root]
         dict set tool $root [dict create command $root words [kelmartool::help $root] class [classOf $word]]
         lappend roots $word
     }
