@@ -2,6 +2,7 @@
 #   make build   configure and build into build/ (libraries and pkgIndex.tcl in build/lib)
 #   make test    build and run every test, then again under AddressSanitizer and UBSan
 #   make demo    build and run the tour of the reference tool on the sample design
+#   make docs    build and write docs/commands.md, the command reference, running its examples
 #   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
 #   make bench-icount  the same cases in instructions per call, counted under valgrind's callgrind
 #   make fuzz    seeded random command lines under the sanitizers, in build-fuzz/ (not part of make test)
@@ -43,6 +44,12 @@ test: test-plain test-sanitize
 
 demo: build
 	$(BUILD)/bin/kelmarsh -project examples/designs/counter.json examples/tour.tcl
+
+# The command reference is made from the command tables, the package, the tool's help and
+# docs/reference/entries.tcl; tests/tcl/reference.test fails when the checked-in one differs.
+.PHONY: docs
+docs: build
+	tclsh8.6 docs/reference/generate.tcl $(BUILD)/lib docs/commands.md
 
 # The benchmark has its own Release build folder and its own packages: swig makes the
 # generated-binding baseline, valgrind counts the instructions of bench-icount. The figures land in
