@@ -42,9 +42,10 @@ set scratch [file join [expr {[info exists ::env(TMPDIR)] ? $::env(TMPDIR) : "/t
 file mkdir $scratch
 
 section "Project ($design)"
-step {project GetFileName}
+# The file's full path depends on the checkout; its last part does not.
+step {file tail [project GetFileName]}
 step {set hd [project GetHDProject]}
-step {[$hd GetInterface $::kelmar::TcltaskI::ITclProjectID] GetFileName}
+step {file tail [[$hd GetInterface $::kelmar::TcltaskI::ITclProjectID] GetFileName]}
 # Any object can be kept on a project; here the object query, as a plain interface.
 set ::IInterfaceID c569a982-87c5-4d45-8a2c-17b796723bdc
 step {set query [obj GetInterface $::IInterfaceID]}
