@@ -1,10 +1,12 @@
 // kelmarsh: the tool's Tcl shell.
 //
-//   kelmarsh ?-project FILE? ?--? ?script.tcl? ?arg ...?
+//   kelmarsh ?-project FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
 //
 // Loads the tool package from the lib folder beside the shell's own binary, opens FILE as the current
-// project when given, then runs the script, or reads commands at a prompt.
+// project when given, then runs the script, or reads commands: at a terminal with line editing,
+// history and completion (shell/), otherwise as tclsh reads them.
 #include <tcl.h>
+#include <unistd.h>
 
 #include <cstdio>
 #include <string>
@@ -12,11 +14,13 @@
 
 #include "shell/command_line.h"
 #include "shell/error_trace.h"
+#include "shell/interactive.h"
 #include "shell/package_dirs.h"
 
 namespace {
 
 kelmarsh::CommandLine g_commandLine;
+std::string g_openMessage;  // what opening the project said, the banner of the prompt
 
 void ReportScriptError(Tcl_Interp* interp) { std::fprintf(stderr, "%s\n", kelmarsh::ErrorTrace(interp).c_str()); }
 
@@ -64,7 +68,18 @@ void OpenProject(Tcl_Interp* interp) {
         std::fprintf(stderr, "kelmarsh: %s\n", Tcl_GetStringResult(interp));
         Tcl_Exit(1);
     }
+    g_openMessage = Tcl_GetStringResult(interp);
     Tcl_ResetResult(interp);
+}
+
+// Without a script and with a terminal on the input, the shell's own prompt; it ends the process.
+// Commands piped in are left to Tcl_Main, which reads them as tclsh does.
+void RunPrompt(Tcl_Interp* interp) {
+    if (g_commandLine.hasScript || !isatty(0)) return;
+    kelmarsh::InteractiveSettings settings;
+    if (!g_openMessage.empty()) settings.banner = "kelmarsh " KELMAR_VERSION ": " + g_openMessage;
+    settings.readStartupFile = g_commandLine.readStartupFile;
+    Tcl_Exit(kelmarsh::RunInteractive(interp, settings));
 }
 
 int AppInit(Tcl_Interp* interp) {
@@ -79,6 +94,7 @@ int AppInit(Tcl_Interp* interp) {
     }
     OpenProject(interp);
     RunScript(interp);
+    RunPrompt(interp);
     return TCL_OK;
 }
 

@@ -14,15 +14,17 @@ CommandLine Refused(std::string why) {
 }
 
 constexpr const char kSynopsis[] =
-    "usage: kelmarsh ?-project FILE? ?--? ?script.tcl? ?arg ...?\n"
+    "usage: kelmarsh ?-project FILE? ?-norc? ?--? ?script.tcl? ?arg ...?\n"
     "       kelmarsh -h | --help | --version\n";
 
 constexpr const char kDetails[] =
     "  -project FILE  open the design FILE as the current project first\n"
+    "  -norc          do not read ~/.kelmarshrc at the interactive prompt\n"
     "  --             the next word is the script, even if it begins with -\n"
     "  -h, --help     print this text and exit\n"
     "  --version      print the version and exit\n"
-    "Without a script, kelmarsh reads commands from its input. Type help for the tool's commands.\n";
+    "Without a script, kelmarsh reads commands from its input; at a terminal with line editing,\n"
+    "history in ~/.kelmarsh_history and completion by Tab. Type help for the tool's commands.\n";
 
 }  // namespace
 
@@ -48,6 +50,8 @@ CommandLine ParseCommandLine(int argc, const char* const argv[]) {
             if (!line.project.empty()) return Refused("-project given twice");
             line.project = argv[++i];
             if (line.project.empty()) return Refused("-project needs a design file");
+        } else if (word == "-norc") {
+            line.readStartupFile = false;
         } else if (word == "--") {
             ++i;
             break;
