@@ -77,7 +77,9 @@ LineReader::LineReader(Tcl_Interp* interp, std::string historyFile)
     el_set(editor, EL_SIGNAL, 0);  // Ctrl-C is the shell's own: it must break the read
     el_set(editor, EL_PROMPT, &LineReader::Prompt);
     el_set(editor, EL_HIST, history, m_history.get());
-    el_set(editor, EL_ADDFN, "kelmarsh-complete", "complete the word before the cursor", &LineReader::OnTab);
+    // The wide form: libedit keeps these names as given, where the narrow form copies them and
+    // never frees the copies.
+    el_wset(editor, EL_ADDFN, L"kelmarsh-complete", L"complete the word before the cursor", &LineReader::OnTab);
     el_set(editor, EL_BIND, "^I", "kelmarsh-complete", nullptr);
     el_source(editor, nullptr);  // the user's ~/.editrc may bind keys otherwise
 
@@ -115,6 +117,10 @@ std::optional<std::string> LineReader::Read(const char* prompt, const std::strin
     if (m_editor == nullptr) return std::nullopt;
     m_prompt = prompt;
     m_pending = pending;
+    // The terminal goes into editing mode before the prompt shows, not after: keys typed as soon as
+    // the prompt is seen would otherwise meet the terminal's own line mode, which echoes them and
+    // turns Ctrl-D into an end of input that editing mode then loses.
+    el_set(m_editor.get(), EL_PREP_TERM, 1);
     int count = 0;
     const char* line = el_gets(m_editor.get(), &count);
     if (line == nullptr || count <= 0) {
