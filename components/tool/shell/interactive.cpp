@@ -77,7 +77,7 @@ int RunInteractive(Tcl_Interp* interp, const InteractiveSettings& settings) {
     if (!settings.banner.empty()) WriteLine(TCL_STDOUT, settings.banner);
     if (settings.readStartupFile && !home.empty()) RunStartupFile(interp, home + "/.kelmarshrc", watcher);
 
-    LineReader reader(interp, home.empty() ? "" : home + "/.kelmarsh_history");
+    LineReader reader(interp, home.empty() ? "" : home + "/.kelmarsh_history", watcher.PromptFd());
     std::string pending;  // the lines of a command that is not complete yet
     for (;;) {
         FlushOutput();

@@ -12,30 +12,53 @@ namespace {
 
 // The handler's only state: where to write, and whether Ctrl-C came. One watcher exists at a time.
 volatile sig_atomic_t g_signalFd = -1;
+volatile sig_atomic_t g_promptFd = -1;
 volatile sig_atomic_t g_interrupted = 0;
+
+// A pipe whose ends never block: the handler must not wait on a full one, and the prompt drains
+// its own without waiting.
+bool MakePipe(int (&ends)[2]) {
+    if (pipe(ends) != 0) return false;
+    for (int fd : ends) {
+        fcntl(fd, F_SETFL, fcntl(fd, F_GETFL) | O_NONBLOCK);
+        fcntl(fd, F_SETFD, FD_CLOEXEC);
+    }
+    return true;
+}
+
+void WriteByte(int fd) {
+    if (fd < 0) return;
+    const char byte = 'i';
+    [[maybe_unused]] const ssize_t written = write(fd, &byte, 1);
+}
 
 }  // namespace
 
 InterruptWatcher::InterruptWatcher(Tcl_Interp* interp) : m_interp(interp) {
-    if (pipe(m_pipe) != 0) {
+    if (!MakePipe(m_pipe)) {
         m_stopped = true;  // without a pipe Ctrl-C keeps its default effect
         return;
     }
-    // The handler must never block on a full pipe; the thread reads it empty all the time.
-    fcntl(m_pipe[1], F_SETFL, fcntl(m_pipe[1], F_GETFL) | O_NONBLOCK);
-    fcntl(m_pipe[0], F_SETFD, FD_CLOEXEC);
-    fcntl(m_pipe[1], F_SETFD, FD_CLOEXEC);
-    try {
-        m_thread = std::thread(&InterruptWatcher::Watch, this);
-    } catch (const std::system_error&) {
+    if (!MakePipe(m_prompt)) {
         close(m_pipe[0]);
         close(m_pipe[1]);
         m_stopped = true;
         return;
     }
+    // The thread waits on its pipe.
+    fcntl(m_pipe[0], F_SETFL, fcntl(m_pipe[0], F_GETFL) & ~O_NONBLOCK);
+    try {
+        m_thread = std::thread(&InterruptWatcher::Watch, this);
+    } catch (const std::system_error&) {
+        for (int fd : {m_pipe[0], m_pipe[1], m_prompt[0], m_prompt[1]}) close(fd);
+        m_prompt[0] = -1;
+        m_stopped = true;
+        return;
+    }
     g_signalFd = m_pipe[1];
+    g_promptFd = m_prompt[1];
 
-    // No SA_RESTART: the signal must break the terminal read at the prompt.
+    // No SA_RESTART: a call of the running command that waits returns, and the cancel is seen.
     struct sigaction action {};
     action.sa_handler = &InterruptWatcher::OnSignal;
     sigemptyset(&action.sa_mask);
@@ -56,20 +79,21 @@ void InterruptWatcher::Stop() {
     m_stopped = true;
     sigaction(SIGINT, &m_previous, nullptr);
     g_signalFd = -1;
+    g_promptFd = -1;
     close(m_pipe[1]);  // the thread reads the end of the pipe and returns
     m_thread.join();
     close(m_pipe[0]);
+    close(m_prompt[1]);
+    close(m_prompt[0]);
+    m_prompt[0] = -1;
 }
 
 void InterruptWatcher::OnSignal(int) {
+    const int saved = errno;
     g_interrupted = 1;
-    const int fd = g_signalFd;
-    if (fd >= 0) {
-        const int saved = errno;
-        const char byte = 'i';
-        [[maybe_unused]] const ssize_t written = write(fd, &byte, 1);
-        errno = saved;
-    }
+    WriteByte(g_signalFd);
+    WriteByte(g_promptFd);
+    errno = saved;
 }
 
 void InterruptWatcher::Watch() {
@@ -101,6 +125,9 @@ bool InterruptWatcher::EndCommand() {
 }
 
 bool InterruptWatcher::TakeInterrupt() {
+    char bytes[64];
+    while (m_prompt[0] >= 0 && read(m_prompt[0], bytes, sizeof bytes) > 0) {
+    }
     const bool interrupted = g_interrupted != 0;
     g_interrupted = 0;
     return interrupted;

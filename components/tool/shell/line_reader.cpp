@@ -1,6 +1,7 @@
 #include "shell/line_reader.h"
 
 #include <fcntl.h>
+#include <poll.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -9,6 +10,7 @@
 #include <clocale>
 #include <cstdio>
 #include <cstring>
+#include <cwchar>
 #include <string_view>
 #include <vector>
 
@@ -53,9 +55,10 @@ void ShowList(EditLine* editor, const std::vector<std::string>& words) {
 
 }  // namespace
 
-LineReader::LineReader(Tcl_Interp* interp, std::string historyFile)
+LineReader::LineReader(Tcl_Interp* interp, std::string historyFile, int interruptFd)
     : m_completer(interp),
       m_historyFile(std::move(historyFile)),
+      m_interruptFd(interruptFd),
       m_history(history_init(), &history_end),
       m_editor(nullptr, &el_end) {
     std::setlocale(LC_CTYPE, "");  // so that the editor takes a UTF-8 character as one
@@ -76,6 +79,7 @@ LineReader::LineReader(Tcl_Interp* interp, std::string historyFile)
     el_set(editor, EL_EDITOR, "emacs");
     el_set(editor, EL_SIGNAL, 0);  // Ctrl-C is the shell's own: it must break the read
     el_set(editor, EL_PROMPT, &LineReader::Prompt);
+    el_wset(editor, EL_GETCFN, &LineReader::GetChar);
     el_set(editor, EL_HIST, history, m_history.get());
     // The wide form: libedit keeps these names as given, where the narrow form copies them and
     // never frees the copies.
@@ -111,6 +115,42 @@ char* LineReader::Prompt(EditLine* editor) {
     void* data = nullptr;
     el_get(editor, EL_CLIENTDATA, &data);
     return static_cast<LineReader*>(data)->m_prompt.data();
+}
+
+// The editor's reads of the terminal, which end at once when Ctrl-C came, wherever the editor was
+// when it came: a signal alone breaks a read only while it waits. -1 then, 0 at the end of input.
+int LineReader::GetChar(EditLine* editor, wchar_t* character) {
+    void* data = nullptr;
+    el_get(editor, EL_CLIENTDATA, &data);
+    const int interruptFd = static_cast<LineReader*>(data)->m_interruptFd;
+    std::mbstate_t state{};
+    for (;;) {
+        pollfd watched[2] = {{STDIN_FILENO, POLLIN, 0}, {interruptFd, POLLIN, 0}};
+        if (poll(watched, interruptFd >= 0 ? 2 : 1, -1) < 0) {
+            if (errno == EINTR) continue;  // Ctrl-C shows in the pipe
+            return -1;
+        }
+        if (interruptFd >= 0 && (watched[1].revents & POLLIN) != 0) {
+            errno = EINTR;
+            return -1;
+        }
+        char byte;
+        const ssize_t got = read(STDIN_FILENO, &byte, 1);
+        if (got == 0) return 0;
+        if (got < 0) {
+            if (errno == EINTR || errno == EAGAIN) continue;
+            return -1;
+        }
+        wchar_t decoded;
+        const std::size_t used = std::mbrtowc(&decoded, &byte, 1, &state);
+        if (used == static_cast<std::size_t>(-2)) continue;  // more bytes of one character to come
+        if (used == static_cast<std::size_t>(-1)) {
+            decoded = static_cast<unsigned char>(byte);  // not in the locale's encoding: the byte itself
+            state = std::mbstate_t{};
+        }
+        *character = decoded;
+        return 1;
+    }
 }
 
 std::optional<std::string> LineReader::Read(const char* prompt, const std::string& pending) {

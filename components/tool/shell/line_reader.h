@@ -19,8 +19,9 @@ namespace kelmarsh {
 
 class LineReader {
 public:
-    // `historyFile` empty: history for this run only.
-    LineReader(Tcl_Interp* interp, std::string historyFile);
+    // `historyFile` empty: history for this run only. A read ends as interrupted once
+    // `interruptFd` is readable (-1: never).
+    LineReader(Tcl_Interp* interp, std::string historyFile, int interruptFd);
     ~LineReader();
     LineReader(const LineReader&) = delete;
     LineReader& operator=(const LineReader&) = delete;
@@ -35,6 +36,7 @@ public:
 
 private:
     static char* Prompt(EditLine* editor);
+    static int GetChar(EditLine* editor, wchar_t* character);
     static unsigned char OnTab(EditLine* editor, int key);
     static void OnExit(ClientData data);
     unsigned char Complete(EditLine* editor);
@@ -44,6 +46,7 @@ private:
     std::string m_historyFile;
     std::string m_prompt;
     std::string m_pending;
+    int m_interruptFd;
     // The editor refers to the history: it goes first.
     std::unique_ptr<History, decltype(&history_end)> m_history;
     std::unique_ptr<EditLine, decltype(&el_end)> m_editor;
