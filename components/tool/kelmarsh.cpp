@@ -1,31 +1,29 @@
 // kelmarsh: the tool's Tcl shell.
 //
-//   kelmarsh ?-project FILE? ?script.tcl? ?arg ...?
+//   kelmarsh ?-project FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
 //
-// Loads the tool package from the lib folder beside the shell's bin folder, imports its root
+// Loads the tool package from the lib folder beside the shell's own binary, imports its root
 // commands and makes `help`, opens FILE as the current project when given, then runs the script,
-// or reads commands at a prompt.
+// or reads commands: at a terminal with line editing, history and completion (shell/), otherwise as
+// tclsh reads them.
 #include <tcl.h>
+#include <unistd.h>
 
 #include <cstdio>
-#include <cstring>
 #include <string>
 #include <vector>
 
+#include "shell/command_line.h"
+#include "shell/error_trace.h"
+#include "shell/interactive.h"
+#include "shell/package_dirs.h"
+
 namespace {
 
-const char* g_project = nullptr;
+kelmarsh::CommandLine g_commandLine;
+std::string g_openMessage;  // what opening the project said, the banner of the prompt
 
-// The message of a failed script once, then the trace of where it failed. An error of the package
-// puts its text into the result and adds it to errorInfo, which then begins with the text twice.
-void ReportScriptError(Tcl_Interp* interp) {
-    const std::string message = Tcl_GetStringResult(interp);
-    const char* info = Tcl_GetVar2(interp, "errorInfo", nullptr, TCL_GLOBAL_ONLY);
-    std::string trace = info != nullptr ? info : message;
-    if (!message.empty() && trace.compare(0, 2 * message.size(), message + message) == 0)
-        trace.erase(0, message.size());
-    std::fprintf(stderr, "%s\n", trace.c_str());
-}
+void ReportScriptError(Tcl_Interp* interp) { std::fprintf(stderr, "%s\n", kelmarsh::ErrorTrace(interp).c_str()); }
 
 // A script given on the command line runs here rather than in Tcl_Main, so that its failure is told
 // by ReportScriptError. The shell ends with the script, as Tcl's own does: 0, or 1 on failure.
@@ -43,13 +41,55 @@ void RunScript(Tcl_Interp* interp) {
     Tcl_Exit(0);
 }
 
+// The packages are looked for beside the binary itself, through every symbolic link to it, ahead of
+// any other folder: the shell loads the tool it was built with.
+void AddPackageDirs(Tcl_Interp* interp) {
+    const char* named = Tcl_GetNameOfExecutable();
+    Tcl_Obj* dirs = Tcl_NewListObj(0, nullptr);
+    for (const std::string& dir : kelmarsh::PackageDirs(kelmarsh::ResolvedExecutable(named ? named : "")))
+        Tcl_ListObjAppendElement(nullptr, dirs, Tcl_NewStringObj(dir.c_str(), -1));
+    Tcl_Obj* command[] = {Tcl_NewStringObj("apply", -1),
+                          Tcl_NewStringObj("dirs {set ::auto_path [linsert $::auto_path 0 {*}$dirs]}", -1), dirs};
+    Tcl_Obj* line = Tcl_NewListObj(3, command);
+    Tcl_IncrRefCount(line);
+    Tcl_EvalObjEx(interp, line, 0);
+    Tcl_DecrRefCount(line);
+    Tcl_ResetResult(interp);
+}
+
+void OpenProject(Tcl_Interp* interp) {
+    if (g_commandLine.project.empty()) return;
+    Tcl_Obj* command[] = {Tcl_NewStringObj("::kelmartool::open", -1),
+                          Tcl_NewStringObj(g_commandLine.project.c_str(), -1)};
+    Tcl_Obj* line = Tcl_NewListObj(2, command);
+    Tcl_IncrRefCount(line);
+    const int code = Tcl_EvalObjEx(interp, line, 0);
+    Tcl_DecrRefCount(line);
+    if (code != TCL_OK) {
+        std::fprintf(stderr, "kelmarsh: %s\n", Tcl_GetStringResult(interp));
+        Tcl_Exit(1);
+    }
+    g_openMessage = Tcl_GetStringResult(interp);
+    Tcl_ResetResult(interp);
+}
+
+// Without a script and with a terminal on the input, the shell's own prompt; it ends the process.
+// Commands piped in are left to Tcl_Main, which reads them as tclsh does.
+void RunPrompt(Tcl_Interp* interp) {
+    if (g_commandLine.hasScript || !isatty(0)) return;
+    kelmarsh::InteractiveSettings settings;
+    if (!g_openMessage.empty()) settings.banner = "kelmarsh " KELMAR_VERSION ": " + g_openMessage;
+    settings.readStartupFile = g_commandLine.readStartupFile;
+    Tcl_Exit(kelmarsh::RunInteractive(interp, settings));
+}
+
 int AppInit(Tcl_Interp* interp) {
     if (Tcl_Init(interp) != TCL_OK) return TCL_ERROR;
+    AddPackageDirs(interp);
     // The tool keeps its roots in ::kelmartool; the shell imports them one by one, so that a name
     // taken already (by a package on the path, say) costs that name alone, and says so. `help` is
     // what the package's wrong-count messages ask for.
     static const char* const kSetup =
-        "lappend ::auto_path [file join [file dirname [file dirname [file normalize [info nameofexecutable]]]] lib]\n"
         "package require KelmarTool\n"
         "apply {{} {\n"
         "    foreach root [namespace eval ::kelmartool {namespace export}] {\n"
@@ -68,36 +108,35 @@ int AppInit(Tcl_Interp* interp) {
         std::fprintf(stderr, "kelmarsh: %s\n", Tcl_GetStringResult(interp));
         Tcl_Exit(1);
     }
-    if (g_project != nullptr) {
-        Tcl_Obj* command[] = {Tcl_NewStringObj("::kelmartool::open", -1), Tcl_NewStringObj(g_project, -1)};
-        Tcl_Obj* line = Tcl_NewListObj(2, command);
-        Tcl_IncrRefCount(line);
-        const int code = Tcl_EvalObjEx(interp, line, 0);
-        Tcl_DecrRefCount(line);
-        if (code != TCL_OK) {
-            std::fprintf(stderr, "kelmarsh: %s\n", Tcl_GetStringResult(interp));
-            Tcl_Exit(1);
-        }
-        Tcl_ResetResult(interp);
-    }
+    OpenProject(interp);
     RunScript(interp);
+    RunPrompt(interp);
     return TCL_OK;
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
-    std::vector<char*> args{argv[0]};
-    int i = 1;
-    if (i < argc && std::strcmp(argv[i], "-project") == 0) {
-        if (i + 1 >= argc) {
-            std::fprintf(stderr, "usage: kelmarsh ?-project FILE? ?script.tcl? ?arg ...?\n");
+    g_commandLine = kelmarsh::ParseCommandLine(argc, argv);
+    switch (g_commandLine.action) {
+        case kelmarsh::CommandLine::Action::Help:
+            std::fputs(kelmarsh::UsageText().c_str(), stdout);
+            return 0;
+        case kelmarsh::CommandLine::Action::Version:
+            std::printf("kelmarsh %s\n", KELMAR_VERSION);
+            return 0;
+        case kelmarsh::CommandLine::Action::Error:
+            std::fprintf(stderr, "kelmarsh: %s\n%s", g_commandLine.error.c_str(), kelmarsh::Synopsis());
             return 2;
-        }
-        g_project = argv[i + 1];
-        i += 2;
+        case kelmarsh::CommandLine::Action::Run:
+            break;
     }
-    for (; i < argc; ++i) args.push_back(argv[i]);
+    // The script is handed to Tcl_Main as already chosen, so that it takes every word after it as
+    // the script's arguments, a word that begins with - too.
+    Tcl_FindExecutable(argv[0]);
+    if (g_commandLine.hasScript) Tcl_SetStartupScript(Tcl_NewStringObj(g_commandLine.script.c_str(), -1), nullptr);
+    std::vector<char*> args{argv[0]};
+    for (std::string& arg : g_commandLine.scriptArgs) args.push_back(arg.data());
     args.push_back(nullptr);
     Tcl_Main(static_cast<int>(args.size()) - 1, args.data(), AppInit);
     return 0;
