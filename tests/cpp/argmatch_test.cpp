@@ -1,36 +1,21 @@
 // The matcher and the option name list, driven through the factory as a matched method drives them.
-#include <dlfcn.h>
 #include <gtest/gtest.h>
 
-#include <filesystem>
 #include <string>
 #include <vector>
 
 #include "ArgMatch/ICmdArgMatcher.h"
 #include "CitP/Factory.h"
 #include "CitP/InstanceTable.h"
+#include "harness.h"
 
 namespace {
-
-// Where ctest says the libraries are, else build/lib beside this program's build/bin.
-std::string LibraryDir() {
-    if (const char* dir = getenv("KELMAR_LIB")) return dir;
-    return std::filesystem::read_symlink("/proc/self/exe").parent_path().string() + "/../lib";
-}
 
 using CommonI::RefCountPtr;
 using Names = std::vector<std::string>;
 
-// Whether merely opening the library, before the factory's loader ever ran, made its classes known.
-bool g_knownBeforeOpen = true, g_knownAfterOpen = false;
-struct OpenFirst : ::testing::Environment {
-    void SetUp() override {
-        g_knownBeforeOpen = CitP::Factory::IsRegistered(CmdArgMatcherID);
-        dlopen((LibraryDir() + "/libArgMatchKit.so").c_str(), RTLD_NOW);
-        g_knownAfterOpen = CitP::Factory::IsRegistered(CmdArgMatcherID) && CitP::Factory::IsRegistered(OptionNameListID);
-    }
-};
-const auto* g_env = ::testing::AddGlobalTestEnvironment(new OpenFirst);
+const harness::OpenFirst* const g_opened =
+    harness::OpenFirst::Add("libArgMatchKit", {CmdArgMatcherID, OptionNameListID});
 
 template <class T>
 RefCountPtr<T> Create(const Port::XUID& classId) {
@@ -67,10 +52,7 @@ protected:
     RefCountPtr<ICmdArgMatcher> matcher = Create<ICmdArgMatcher>(CmdArgMatcherID);
 };
 
-TEST(ArgMatchLoad, OpeningTheLibraryRegistersItsClasses) {
-    EXPECT_FALSE(g_knownBeforeOpen);
-    EXPECT_TRUE(g_knownAfterOpen);
-}
+TEST(ArgMatchLoad, OpeningTheLibraryRegistersItsClasses) { g_opened->ExpectOpeningRegistered(); }
 
 TEST_F(ArgMatch, ExactNameWinsElsePrefixes) {
     const struct {

@@ -3,14 +3,16 @@
 #include <gtest/gtest.h>
 #include <tcl.h>
 
-#include <filesystem>
 #include <functional>
 #include <stdexcept>
 #include <string>
 
 #include "CitP/Factory.h"
+#include "Dpm/IProjectHelper.h"
+#include "HdcI/IHDProject.h"
 #include "Script/KelmarPkg.h"
-#include "TcltaskI/ITclProject.h"
+#include "TcltaskI/ISearch.h"
+#include "harness.h"
 #include "marshal/fetch_store.h"
 #include "marshal/property.h"
 
@@ -20,11 +22,6 @@ using TcltaskI::Fetch_InterfaceType;
 using TcltaskI::Fetch_Type;
 using TcltaskI::Store_InterfaceType;
 using TcltaskI::Store_Type;
-
-std::string LibraryDir() {
-    if (const char* dir = getenv("KELMAR_LIB")) return dir;
-    return std::filesystem::read_symlink("/proc/self/exe").parent_path().string() + "/../lib";
-}
 
 // A counted object of interface I that says when it ends.
 template <class I>
@@ -83,23 +80,16 @@ public:
     Port_String GetName() override { return "helper"; }
 };
 
-// A project that throws when asked for a face it does not know.
-class ThrowingProject final : public Counted<TcltaskI::ITclProject> {
+// A search that throws when asked for a face it does not know.
+class ThrowingSearch final : public Counted<TcltaskI::ISearch> {
 public:
-    CommonI::RESULT OpenWithHelper(const Port_String&, Dpm::IProjectHelper*, Port_String&) override { return 1; }
-    CommonI::RESULT Close() override { return 1; }
-    Port_String GetFileName() override { return {}; }
-    HdcI::MIHDProject GetHDProject() override { return nullptr; }
-    Dpm::IProjectHelper* GetProjectHelper() override { return nullptr; }
-    CommonI::RESULT Sync(Port_String&) override { return 1; }
-    CommonI::RESULT Reload(Port_String&) override { return 1; }
-    CommonI::RESULT RegisterComponent(const Port::XUID&, CitI::MIInterface&) override { return 1; }
-    CommonI::RESULT UnRegisterComponent(CitI::MIInterface&) override { return 1; }
-    CitI::MIInterface GetComponent(const Port::XUID&) override { return nullptr; }
+    CommonI::RESULT search(const Str&, bool, bool, bool, bool, const List&, const List&, Out&, Msg&) override {
+        return 1;
+    }
 
 protected:
     bool Answers(const Port::XUID& id) override {
-        if (id == TcltaskI::ITclProjectID) return true;
+        if (id == TcltaskI::ISearchID) return true;
         throw std::runtime_error("no such face");
     }
 };
@@ -115,13 +105,13 @@ public:
     Script::Handle* GetSharedHandle() override { return nullptr; }
 };
 
-class Marshal : public ::testing::Test {
+class Marshal : public ::testing::Test, protected harness::InInterp {
 protected:
     static void SetUpTestSuite() {
         Tcl_FindExecutable(nullptr);
         interp = Tcl_CreateInterp();
         Kelmarpkg_Init(interp);
-        const std::string dir = LibraryDir();
+        const std::string dir = harness::LibraryDir();
         ASSERT_EQ(Eval("load " + dir + "/libTcltaskI_Morvane.so Tcltaski_morvane"), TCL_OK) << Result();
         ASSERT_EQ(Eval("load " + dir + "/libTcltaskI_TestKit.so Tcltaski_testkit"), TCL_OK) << Result();
         ASSERT_TRUE(CitP::Factory::LoadLibraryFactory("libTcltask_Support"));
@@ -135,8 +125,6 @@ protected:
         Tcl_SetObjResult(interp, Tcl_NewStringObj("held", -1));
     }
 
-    static int Eval(const std::string& script) { return Tcl_Eval(interp, script.c_str()); }
-    static std::string Result() { return Tcl_GetStringResult(interp); }
     static std::string ErrorInfo() {
         Tcl_Obj* options = Tcl_GetReturnOptions(interp, TCL_ERROR);
         Tcl_IncrRefCount(options);
@@ -149,23 +137,11 @@ protected:
         Tcl_DecrRefCount(options);
         return text;
     }
-    static std::string Var(const char* name) {
-        const char* value = Tcl_GetVar(interp, name, TCL_GLOBAL_ONLY);
-        return value ? value : "<unset>";
-    }
     // The result of a report without reset: the text in the result, behind the earlier errorInfo.
     static void ExpectReportWithoutReset(int status, const std::string& text) {
         EXPECT_EQ(status, 1);
         EXPECT_EQ(Result(), text);
         EXPECT_EQ(ErrorInfo(), "earlier|" + text);
-    }
-    // The wrapper behind a word that a script holds.
-    static Script::Handle* HandleOf(const std::string& word) {
-        Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
-        Tcl_IncrRefCount(obj);
-        Script::Handle* handle = Script::PtrHandleBase::GetHandleFromTclObj(obj);
-        Tcl_DecrRefCount(obj);
-        return handle;
     }
     static std::string Made(const std::string& script) {
         EXPECT_EQ(Eval(script), TCL_OK) << Result();
@@ -175,15 +151,14 @@ protected:
     static void Forget(const std::string& words) {
         EXPECT_EQ(Eval("foreach w {" + words + "} { rename $w {} }"), TCL_OK) << Result();
     }
-
-    static inline Tcl_Interp* interp = nullptr;
 };
 
 using Word = Script::TclStringHandle;
 
-// Directions that no command uses: each is a report without reset, and drops no reference.
+// Directions that no command uses, and a word that is no object: each is a report without reset, and
+// drops no reference.
 TEST_F(Marshal, FetchesRefuseOutAndResultStoresRefuseInAndAnOutWithoutVariable) {
-    Word word("0", interp);
+    Word word("0", interp), junk("junk", interp);
     Dpm::IProjectHelper* helper = nullptr;
     FakeHelper fake;
     CitI::MIInterface component;
@@ -198,6 +173,8 @@ TEST_F(Marshal, FetchesRefuseOutAndResultStoresRefuseInAndAnOutWithoutVariable) 
          "Fetch_InterfaceType was called for an OUT parameter, which indicates a failure."},
         {[&] { return Fetch_InterfaceType(component, interp, nullptr, Script::RESULT); },
          "Fetch_InterfaceType was called for a RESULT, which indicates a failure"},
+        {[&] { return Fetch_InterfaceType(component, interp, &junk, Script::IN); },
+         "Unable to fetch an object of Interface type from parameter"},
         {[&] { return Fetch_InterfaceType(property, interp, &word, Script::OUT); },
          "Fetch_InterfaceType<UtilI::ITclProperty> was called for an OUT parameter, which indicates a failure."},
         {[&] { return Fetch_InterfaceType(property, interp, nullptr, Script::RESULT); },
@@ -220,6 +197,7 @@ TEST_F(Marshal, FetchesRefuseOutAndResultStoresRefuseInAndAnOutWithoutVariable) 
         SetUp();
         ExpectReportWithoutReset(run(), text);
     }
+    EXPECT_FALSE(component);
     EXPECT_FALSE(property);
     EXPECT_EQ(static_cast<FakeHDProject*>(project.get())->Count(), 1);
 }
@@ -285,18 +263,14 @@ TEST_F(Marshal, ComponentsComeInCountedFromHandlesAndVariablesAndZeroIsNull) {
     component = nullptr;
     Forget(word);
 
-    // By value: 0, NULL and 0x0 are null, other words no object. (Null objects through the
-    // project commands are pinned by the scripts' tests.)
+    // By value: 0, NULL and 0x0 are null; another word is refused in the first test. (Null objects
+    // through the project commands are pinned by the scripts' tests.)
     for (const char* text : {"0", "NULL", "0x0"}) {
         Word zero(text, interp);
         CitI::MIInterface held(new Counted<CitI::IInterface>);
         EXPECT_EQ(Fetch_InterfaceType(held, interp, &zero, Script::IN), 0) << text;
         EXPECT_FALSE(held) << text;
     }
-    Word junk("junk", interp);
-    SetUp();
-    ExpectReportWithoutReset(Fetch_InterfaceType(component, interp, &junk, Script::IN),
-                             "Unable to fetch an object of Interface type from parameter");
 }
 
 // Properties --------------------------------------------------------------------------------------
@@ -387,9 +361,9 @@ TEST_F(Marshal, AWordWithoutTextIsNULLAndTheCountAndGetInterfaceFailuresDoNotRes
 }
 
 TEST_F(Marshal, GetInterfaceCatchesAnException) {
-    auto* project = new ThrowingProject;
-    CitI::MIInterface owner(static_cast<TcltaskI::ITclProject*>(project));
-    CitI::IInterface* made = Script::TclWrapFactory::CreateInstance(TcltaskI::ITclProjectID, owner.get(), interp);
+    auto* search = new ThrowingSearch;
+    CitI::MIInterface owner(static_cast<TcltaskI::ISearch*>(search));
+    CitI::IInterface* made = Script::TclWrapFactory::CreateInstance(TcltaskI::ISearchID, owner.get(), interp);
     ASSERT_NE(made, nullptr);
     auto* script = static_cast<CitI::IScriptHandle*>(made->GetInterface(CitI::IScriptHandleID));
     ASSERT_NE(script, nullptr);
@@ -399,10 +373,10 @@ TEST_F(Marshal, GetInterfaceCatchesAnException) {
 
     SetUp();
     EXPECT_EQ(Eval(word + " GetInterface 11111111-2222-3333-4444-555555555555"), TCL_ERROR);
-    EXPECT_EQ(Result(), "An exception took place while calling TcltaskI::TclWrapITclProject::GetInterface.");
-    EXPECT_EQ(Eval(word + " GetInterface $::kelmar::TcltaskI::ITclProjectID"), TCL_OK) << Result();
+    EXPECT_EQ(Result(), "An exception took place while calling TcltaskI::TclWrapISearch::GetInterface.");
+    EXPECT_EQ(Eval(word + " GetInterface $::kelmar::TcltaskI::ISearchID"), TCL_OK) << Result();
     EXPECT_EQ(Result(), word);
-    EXPECT_EQ(project->Count(), 1);
+    EXPECT_EQ(search->Count(), 1);
     Forget(word);
 }
 

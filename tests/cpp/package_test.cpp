@@ -12,29 +12,23 @@ namespace {
 
 using CommonI::RefCountPtr;
 
-// A counted object that logs its counting, and answers one task interface.
-class Counted final : public TcltaskI::ICollection {
+// A counted object that logs its counting, and answers one task interface: the search, whose one
+// operation is all there is to stub.
+class Counted final : public TcltaskI::ISearch {
 public:
     explicit Counted(std::vector<std::string>* log) : m_log(log) {}
     ~Counted() override { m_log->push_back("destroyed"); }
 
     CitI::IInterface* GetInterface(const Port::XUID& id) override {
         if (id == CommonI::IRefCountID) return &m_counter;
-        if (id == TcltaskI::ICollectionID || id == CitI::IInterfaceID) return this;
+        if (id == TcltaskI::ISearchID || id == CitI::IInterfaceID) return this;
         return nullptr;
     }
     long Count() const { return m_counter.Count(); }
 
-    CommonI::RESULT append_to(const Str&, const List&, bool, Out&, Msg&) override { return 1; }
-    CommonI::RESULT equal(const Prop&, const Prop&, bool, Out&, Msg&) override { return 1; }
-    CommonI::RESULT copy(const Prop&, Out&, Msg&) override { return 1; }
-    CommonI::RESULT foreach(const Str&, const Prop&, const Str&, Out&, Msg&) override { return 1; }
-    CommonI::RESULT index(const Prop&, int32_t, Out&, Msg&) override { return 1; }
-    CommonI::RESULT remove_from(const Str&, const List&, Out&, Msg&) override { return 1; }
-    CommonI::RESULT sizeof_(const Prop&, Out&, Msg&) override { return 1; }
-    CommonI::RESULT set(const Str&, const Prop&, Out&, Msg&) override { return 1; }
-    CommonI::RESULT get(const Str&, Out&, Msg&) override { return 1; }
-    CommonI::RESULT properties(Out&, Msg&) override { return 1; }
+    CommonI::RESULT search(const Str&, bool, bool, bool, bool, const List&, const List&, Out&, Msg&) override {
+        return 1;
+    }
 
 private:
     // Logs every step so that the order of adding and dropping can be checked.
@@ -67,12 +61,12 @@ TEST(RefCountPtr, CountsThroughTheCounterItAsksFor) {
     std::vector<std::string> log;
     auto* object = new Counted(&log);
     {
-        RefCountPtr<TcltaskI::ICollection> first(object);
+        RefCountPtr<TcltaskI::ISearch> first(object);
         EXPECT_EQ(object->Count(), 1);
-        RefCountPtr<TcltaskI::ICollection> uncounted(object, false);
+        RefCountPtr<TcltaskI::ISearch> uncounted(object, false);
         EXPECT_EQ(object->Count(), 1);
         uncounted.Detach();
-        RefCountPtr<TcltaskI::ICollection> copy(first);
+        RefCountPtr<TcltaskI::ISearch> copy(first);
         EXPECT_EQ(object->Count(), 2);
         // From another interface: the source is asked for the target's identifier and keeps its own.
         RefCountPtr<CitI::IInterface> root(first);
@@ -87,14 +81,14 @@ TEST(RefCountPtr, CountsThroughTheCounterItAsksFor) {
 TEST(RefCountPtr, AssignmentAddsBeforeItDrops) {
     std::vector<std::string> log;
     auto* object = new Counted(&log);
-    RefCountPtr<TcltaskI::ICollection> only(object);
+    RefCountPtr<TcltaskI::ISearch> only(object);
     // Assigning the one reference to itself must not end the object on the way.
-    RefCountPtr<TcltaskI::ICollection>& alias = only;
+    RefCountPtr<TcltaskI::ISearch>& alias = only;
     only = alias;
     EXPECT_EQ(object->Count(), 1);
     EXPECT_EQ(log, (std::vector<std::string>{"add", "add", "drop"}));
 
-    RefCountPtr<TcltaskI::ICollection> empty;
+    RefCountPtr<TcltaskI::ISearch> empty;
     only = empty;
     EXPECT_EQ(log.back(), "destroyed");
 }
@@ -102,12 +96,12 @@ TEST(RefCountPtr, AssignmentAddsBeforeItDrops) {
 TEST(RefCountPtr, AttachTakesNoReferenceAndNullCountsNothing) {
     std::vector<std::string> log;
     auto* object = new Counted(&log);
-    RefCountPtr<TcltaskI::ICollection> held(object);
-    RefCountPtr<TcltaskI::ICollection> attached;
+    RefCountPtr<TcltaskI::ISearch> held(object);
+    RefCountPtr<TcltaskI::ISearch> attached;
     attached.Attach(object);
     EXPECT_EQ(object->Count(), 1);
     attached.Detach();
-    RefCountPtr<TcltaskI::ICollection> null(nullptr);
+    RefCountPtr<TcltaskI::ISearch> null(nullptr);
     RefCountPtr<CitI::IInterface> stillNull(null);
     EXPECT_FALSE(stillNull);
 }
@@ -124,7 +118,7 @@ protected:
 };
 
 TEST_F(WrapperTest, HelperNeverCounts) {
-    Script::TScriptHandleHelper<TcltaskI::TclWrapICollection> helper;
+    Script::TScriptHandleHelper<TcltaskI::TclWrapISearch> helper;
     EXPECT_EQ(helper.GetInterface(CommonI::IRefCountID), nullptr);
     EXPECT_EQ(helper.GetInterface(CitI::IScriptHandleID), &helper);
     EXPECT_FALSE(helper.SetResult(interp));
@@ -136,36 +130,36 @@ TEST_F(WrapperTest, HelperNeverCounts) {
 TEST_F(WrapperTest, FactoryMakesAWrapperHoldingOneReference) {
     std::vector<std::string> log;
     auto* object = new Counted(&log);
-    RefCountPtr<TcltaskI::ICollection> owner(object);
-    Script::TTclWrapFactory<TcltaskI::TclWrapICollection, TcltaskI::ICollection> factory;
+    RefCountPtr<TcltaskI::ISearch> owner(object);
+    Script::TTclWrapFactory<TcltaskI::TclWrapISearch, TcltaskI::ISearch> factory;
     EXPECT_EQ(factory.GetInterface(CitI::ITclWrapFactoryID), &factory);
     EXPECT_EQ(factory.CreateInstance(TcltaskI::IGlobalID, object, interp), nullptr);
-    EXPECT_EQ(factory.CreateInstance(TcltaskI::ICollectionID, nullptr, interp), nullptr);
+    EXPECT_EQ(factory.CreateInstance(TcltaskI::ISearchID, nullptr, interp), nullptr);
     EXPECT_EQ(object->Count(), 1);
 
-    CitI::IInterface* helper = factory.CreateInstance(TcltaskI::ICollectionID, object, interp);
+    CitI::IInterface* helper = factory.CreateInstance(TcltaskI::ISearchID, object, interp);
     ASSERT_NE(helper, nullptr);
     auto* script = static_cast<CitI::IScriptHandle*>(helper->GetInterface(CitI::IScriptHandleID));
     ASSERT_EQ(script, helper);
-    auto* wrapper = dynamic_cast<TcltaskI::TclWrapICollection*>(script->GetHandle());
+    auto* wrapper = dynamic_cast<TcltaskI::TclWrapISearch*>(script->GetHandle());
     ASSERT_NE(wrapper, nullptr);
     EXPECT_EQ(object->Count(), 2);
     EXPECT_EQ(helper->GetInterface(CommonI::IRefCountID), nullptr);
 
     // A plain handle of the type, not a wrapper; the shared handle is one object for any interpreter.
     Script::Handle* plain = wrapper->NewHandle(interp);
-    EXPECT_EQ(dynamic_cast<TcltaskI::TclWrapICollection*>(plain), nullptr);
-    EXPECT_NE(dynamic_cast<Script::PtrHandle<TcltaskI::ICollection>*>(plain), nullptr);
+    EXPECT_EQ(dynamic_cast<TcltaskI::TclWrapISearch*>(plain), nullptr);
+    EXPECT_NE(dynamic_cast<Script::PtrHandle<TcltaskI::ISearch>*>(plain), nullptr);
     delete plain;
     Tcl_Interp* other = Tcl_CreateInterp();
     EXPECT_EQ(wrapper->GetSharedHandle(), wrapper->GetSharedHandle());
-    TcltaskI::TclWrapICollection second(object, other);
+    TcltaskI::TclWrapISearch second(object, other);
     EXPECT_EQ(second.GetSharedHandle(), wrapper->GetSharedHandle());
     second.ReleaseValue();
 
     // A copy takes a reference of its own; the destructor gives none back.
     {
-        TcltaskI::TclWrapICollection copy(*wrapper);
+        TcltaskI::TclWrapISearch copy(*wrapper);
         EXPECT_EQ(object->Count(), 3);
         copy.ReleaseValue();
     }
@@ -177,13 +171,13 @@ TEST_F(WrapperTest, FactoryMakesAWrapperHoldingOneReference) {
 }
 
 TEST_F(WrapperTest, WrapperWithoutObjectCountsNothing) {
-    TcltaskI::TclWrapICollection orphan(nullptr, interp);
+    TcltaskI::TclWrapISearch orphan(nullptr, interp);
     void* value = &orphan;
     EXPECT_EQ(orphan.GetValue(&value), 1);
     orphan.AddRefValue();
     orphan.ReleaseValue();
     EXPECT_EQ(orphan.GetScriptHandle(CitI::IInterfaceID), orphan.GetScriptHandle(CitI::IScriptHandleID));
-    EXPECT_EQ(orphan.GetScriptHandle(TcltaskI::ICollectionID), nullptr);
+    EXPECT_EQ(orphan.GetScriptHandle(TcltaskI::ISearchID), nullptr);
 }
 
 }  // namespace

@@ -16,11 +16,11 @@
 #include "Script/TTclWrapFactory.h"
 #include "Script/TclWrapFactory.h"
 #include "Script/TclWrapSupport.h"
+#include "harness.h"
 
 namespace {
 
 using Script::Handle;
-using Script::PtrHandleBase;
 
 inline constexpr Port::XUIDLiteral IProbeID{0x5c0ffee1d2e34b7aull, 0x9e1f00d5a1b2c3d4ull};
 // Registered by nobody: the resolver has no factory for it.
@@ -121,7 +121,7 @@ Script::TTclWrapFactory<ProbeWrapper, IProbe> g_probeFactory;
 
 std::string Text(const Port::XUID& id) { return id.ToString().c_str(); }
 
-class ScriptTest : public ::testing::Test {
+class ScriptTest : public ::testing::Test, protected harness::InInterp {
 protected:
     static void SetUpTestSuite() {
         Tcl_FindExecutable(nullptr);
@@ -136,28 +136,14 @@ protected:
         EXPECT_EQ(g_liveObjects, 0);
     }
 
-    int Eval(const std::string& script) { return Tcl_Eval(interp, script.c_str()); }
-    std::string Result() const { return Tcl_GetStringResult(interp); }
-    std::string Var(const char* name) const {
-        const char* value = Tcl_GetVar(interp, name, TCL_GLOBAL_ONLY);
-        return value ? value : "<unset>";
-    }
     // Hands `handle` to Tcl and gives its word.
-    std::string HandOver(Handle* handle) {
+    static std::string HandOver(Handle* handle) {
         handle->SetResult(interp);
         return Result();
-    }
-    static PtrHandleBase* HandleOf(const std::string& word) {
-        Tcl_Obj* obj = Tcl_NewStringObj(word.c_str(), -1);
-        Tcl_IncrRefCount(obj);
-        PtrHandleBase* handle = PtrHandleBase::GetHandleFromTclObj(obj);
-        Tcl_DecrRefCount(obj);
-        return handle;
     }
     static bool Starts(const std::string& word, const char* prefix) { return word.rfind(prefix, 0) == 0; }
     static std::vector<std::string> Ended(const std::string& t) { return {"release " + t, "destroy " + t}; }
 
-    Tcl_Interp* interp = nullptr;
     Seen seen;
     IProbe* const someValue = reinterpret_cast<IProbe*>(&seen);  // a value only compared, never called
 };
@@ -331,14 +317,14 @@ TEST_F(ScriptTest, PlainValueHandles) {
     EXPECT_STREQ(text.GetSharedHandle()->GetString(), "");
 }
 
-// One fetch of a value of type T, as text: the value when the fetch succeeds.
+// One fetch of a value of type T into `value`, which no row expects, as text.
 template <class T>
-std::string Fetched(int (*fetch)(T&, Tcl_Interp*, Handle*, int), Tcl_Interp* interp, const char* word,
+std::string Fetched(int (*fetch)(T&, Tcl_Interp*, Handle*, int), T value, Tcl_Interp* interp, const char* word,
                     int direction, int& status) {
     Script::TclStringHandle handle(word, interp);
-    T value{};
     status = fetch(value, interp, &handle, direction);
     if constexpr (std::is_same_v<T, Port_String>) return value.c_str();
+    else if constexpr (std::is_same_v<T, Port::XUID>) return Text(value);
     else return std::to_string(value);
 }
 
@@ -347,7 +333,8 @@ TEST_F(ScriptTest, FetchesByDirection) {
     using S = Script::TclWrapSupport;
     ASSERT_EQ(Eval("set s {a text}; set b off; set i -17"), TCL_OK);
     struct Case { const char* word; int direction; char kind; int status; const char* expected; };
-    const Case cases[] = {  // kind s string, b bool, i int; expected: the value, or a piece of the message
+    // kind s string, b bool, i int, g identifier; expected: the value, or a piece of the message.
+    const Case cases[] = {
         {"hello world", Script::IN, 's', 0, "hello world"},
         {"s", Script::INOUT, 's', 0, "a text"},
         {"nosuch", Script::INOUT, 's', 1, "can't read \"nosuch\": no such variable"},
@@ -363,15 +350,20 @@ TEST_F(ScriptTest, FetchesByDirection) {
         {"4x", Script::IN, 'i', 1, "expected integer but got \"4x\""},
         {"nosuch", Script::INOUT, 'i', 1, "no such variable"},
         {"i", Script::RESULT, 'i', 1, "RESULT"},
+        {"5c0ffee1-d2e3-4b7a-9e1f-00d5a1b2c3d4", Script::IN, 'g', 0, "5c0ffee1-d2e3-4b7a-9e1f-00d5a1b2c3d4"},
+        {"no identifier", Script::IN, 'g', 0, "00000000-0000-0000-0000-000000000000"},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(std::string(1, c.kind) + " " + c.word + " " + std::to_string(c.direction));
         Tcl_ResetResult(interp);
         int status = 1;
-        const int d = c.direction;
-        const std::string got = c.kind == 's'   ? Fetched(&S::FetchString, interp, c.word, d, status)
-                                : c.kind == 'b' ? Fetched(&S::FetchBool, interp, c.word, d, status)
-                                                : Fetched(&S::FetchInt32, interp, c.word, d, status);
+        const auto fetch = [&](auto function, auto stale) {
+            return Fetched(function, stale, interp, c.word, c.direction, status);
+        };
+        const std::string got = c.kind == 's'   ? fetch(&S::FetchString, Port_String("stale"))
+                                : c.kind == 'b' ? fetch(&S::FetchBool, true)
+                                : c.kind == 'i' ? fetch(&S::FetchInt32, int32_t{99})
+                                                : fetch(&S::FetchGuid, Port::XUID(IUnwrappedID));
         EXPECT_EQ(status, c.status);
         if (c.status == 0) {
             EXPECT_EQ(got, c.expected);
@@ -381,13 +373,6 @@ TEST_F(ScriptTest, FetchesByDirection) {
     }
     Port_String value;
     EXPECT_EQ(S::FetchString(value, interp, nullptr, Script::IN), 1);
-
-    Port::XUID id;
-    Script::TclStringHandle idWord(Text(IProbeID).c_str(), interp), noId("no identifier", interp);
-    EXPECT_EQ(S::FetchGuid(id, interp, &idWord, Script::IN), 0);
-    EXPECT_TRUE(id == IProbeID);
-    EXPECT_EQ(S::FetchGuid(id, interp, &noId, Script::IN), 0);
-    EXPECT_TRUE(id.IsNull());
 }
 
 TEST_F(ScriptTest, StoresByDirection) {

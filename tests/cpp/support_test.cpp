@@ -1,35 +1,18 @@
 // The property component, made through the factory, with real Tcl values.
-#include <dlfcn.h>
 #include <gtest/gtest.h>
 #include <tcl.h>
 
-#include <filesystem>
 #include <string>
 #include <vector>
 
 #include "CitP/Factory.h"
 #include "CitP/InstanceTable.h"
 #include "UtilI/ITclProperty.h"
+#include "harness.h"
 
 namespace {
 
-// Where ctest says the libraries are, else build/lib beside this program's build/bin.
-std::string LibraryDir() {
-    if (const char* dir = getenv("KELMAR_LIB")) return dir;
-    return std::filesystem::read_symlink("/proc/self/exe").parent_path().string() + "/../lib";
-}
-
-// Whether merely opening the library, before the factory's loader ever ran, made the class known.
-bool g_knownBeforeOpen = true, g_knownAfterOpen = false;
-struct TclAndOpenFirst : ::testing::Environment {
-    void SetUp() override {
-        Tcl_FindExecutable(nullptr);
-        g_knownBeforeOpen = CitP::Factory::IsRegistered(UtilI::TclPropertyID);
-        dlopen((LibraryDir() + "/libTcltask_Support.so").c_str(), RTLD_NOW);
-        g_knownAfterOpen = CitP::Factory::IsRegistered(UtilI::TclPropertyID);
-    }
-};
-const auto* g_env = ::testing::AddGlobalTestEnvironment(new TclAndOpenFirst);
+const harness::OpenFirst* const g_opened = harness::OpenFirst::Add("libTcltask_Support", {UtilI::TclPropertyID});
 
 // Collects the detail of every property that ends while it is in scope.
 struct DeathLog {
@@ -50,7 +33,10 @@ struct Value {
 
 class Property : public ::testing::Test {
 protected:
-    static void SetUpTestSuite() { ASSERT_TRUE(CitP::Factory::LoadLibraryFactory("libTcltask_Support")); }
+    static void SetUpTestSuite() {
+        Tcl_FindExecutable(nullptr);
+        ASSERT_TRUE(CitP::Factory::LoadLibraryFactory("libTcltask_Support"));
+    }
     static UtilI::MITclProperty Make(Tcl_Obj* value = nullptr) {
         UtilI::MITclProperty p(CitP::Factory::CreateInstanceRef(UtilI::TclPropertyID));
         if (p && value) {
@@ -66,10 +52,7 @@ protected:
     static inline Port_String message;
 };
 
-TEST(PropertyLoad, OpeningTheLibraryRegistersTheClass) {
-    EXPECT_FALSE(g_knownBeforeOpen);
-    EXPECT_TRUE(g_knownAfterOpen);
-}
+TEST(PropertyLoad, OpeningTheLibraryRegistersTheClass) { g_opened->ExpectOpeningRegistered(); }
 
 TEST_F(Property, GivesBackTheValueItTook) {
     auto p = Make();
