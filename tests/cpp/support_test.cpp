@@ -21,12 +21,19 @@ std::string LibraryDir() {
 
 // Whether merely opening the library, before the factory's loader ever ran, made the class known.
 bool g_knownBeforeOpen = true, g_knownAfterOpen = false;
+// The library calls Tcl through its own stub table, which its entry sets from an interpreter.
+int g_entryResult = TCL_ERROR;
 struct TclAndOpenFirst : ::testing::Environment {
     void SetUp() override {
         Tcl_FindExecutable(nullptr);
         g_knownBeforeOpen = CitP::Factory::IsRegistered(UtilI::TclPropertyID);
-        dlopen((LibraryDir() + "/libTcltask_Support.so").c_str(), RTLD_NOW);
+        void* library = dlopen((LibraryDir() + "/libTcltask_Support.so").c_str(), RTLD_NOW);
         g_knownAfterOpen = CitP::Factory::IsRegistered(UtilI::TclPropertyID);
+        auto* entry = library ? reinterpret_cast<int (*)(Tcl_Interp*)>(dlsym(library, "Tcltask_support_Init")) : nullptr;
+        ASSERT_NE(entry, nullptr) << dlerror();
+        Tcl_Interp* interp = Tcl_CreateInterp();
+        g_entryResult = entry(interp);
+        Tcl_DeleteInterp(interp);
     }
 };
 const auto* g_env = ::testing::AddGlobalTestEnvironment(new TclAndOpenFirst);
@@ -69,6 +76,7 @@ protected:
 TEST(PropertyLoad, OpeningTheLibraryRegistersTheClass) {
     EXPECT_FALSE(g_knownBeforeOpen);
     EXPECT_TRUE(g_knownAfterOpen);
+    EXPECT_EQ(g_entryResult, TCL_OK);
 }
 
 TEST_F(Property, GivesBackTheValueItTook) {
