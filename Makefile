@@ -3,6 +3,7 @@
 #   make test    build and run every test, then again under AddressSanitizer and UBSan
 #   make demo    build and run the tour of the reference tool on the sample design
 #   make docs    build and write docs/commands.md, the command reference, running its examples
+#   make install   install under PREFIX (/usr/local), below DESTDIR when given; make uninstall
 #   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
 #   make bench-icount  the same cases in instructions per call, counted under valgrind's callgrind
 #   make fuzz    seeded random command lines under the sanitizers, in build-fuzz/ (not part of make test)
@@ -12,7 +13,8 @@
 BUILD      ?= build
 SAN_BUILD  ?= build-san
 JOBS       ?= 2
-PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev tcl-thread libgtest-dev nlohmann-json3-dev libedit-dev expect
+PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev tcl-thread libgtest-dev nlohmann-json3-dev libedit-dev expect \
+              binutils pkg-config
 CMAKE_ARGS ?=
 
 .PHONY: deps build build-sanitize test test-plain test-sanitize clean demo
@@ -50,6 +52,19 @@ demo: build
 .PHONY: docs
 docs: build
 	tclsh8.6 docs/reference/generate.tcl $(BUILD)/lib docs/commands.md
+
+# The install is placed relative to PREFIX (see cmake/install.cmake); uninstall removes what the
+# last install listed in $(BUILD)/install_manifest.txt, below the same DESTDIR.
+PREFIX  ?= /usr/local
+DESTDIR ?=
+
+.PHONY: install uninstall
+
+install: build
+	DESTDIR="$(DESTDIR)" cmake --install $(BUILD) --prefix "$(PREFIX)"
+
+uninstall:
+	DESTDIR="$(DESTDIR)" cmake -P $(BUILD)/uninstall.cmake
 
 # The benchmark has its own Release build folder and its own packages: swig makes the
 # generated-binding baseline, valgrind counts the instructions of bench-icount. The figures land in

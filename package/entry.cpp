@@ -1,6 +1,7 @@
 // The package entry and the table of identifier variables.
 #include "Script/KelmarPkg.h"
 #include "Script/TclWrapSupport.h"
+#include "UtilI/TclPropertyLibrary.h"
 #include "marshal/options.h"
 #include "package/static_init.h"
 #include "wrappers/registration.h"
@@ -27,15 +28,19 @@ Script::TclWrapIDEntry identifierTable[] = {
 
 }  // namespace
 
-// Brings up the scripting support, requests the component libraries, registers the eleven wrapper
-// factories and publishes the identifiers. Checks nothing and always gives TCL_OK: a library that
-// cannot be loaded now fails the first matched call with the loader failure, and a switch method's
-// default with the default failure.
+// Sets the tables of Tcl functions of the package and of the libraries it calls Tcl through (they
+// reach the Tcl that loads them through its stub table, whatever Tcl that is), brings up the
+// scripting support, requests the component libraries, registers the eleven wrapper factories,
+// publishes the identifiers and provides the package, so that a plain `load` leaves it present.
+// Fails only on a Tcl other than 8.6: a component library that cannot be loaded now fails the first
+// matched call with the loader failure, and a switch method's default with the default failure.
 extern "C" __attribute__((visibility("default"))) int Tcltaski_morvane_Init(Tcl_Interp* interp) {
-    Kelmarpkg_Init(interp);
+    if (Tcl_InitStubs(interp, "8.6", 0) == nullptr || Kelmarpkg_Init(interp) != TCL_OK ||
+        Tcltask_support_Init(interp) != TCL_OK)
+        return TCL_ERROR;
     // Switch methods never request them; without them their property defaults could not be made.
     TcltaskI::RequestComponentLibraries();
     TcltaskI::RegisterWrapperFactories();
     Script::TclWrapSupport::CreateVariables(interp, identifierTable);
-    return TCL_OK;
+    return Tcl_PkgProvide(interp, "TcltaskI_Morvane", KELMAR_VERSION);
 }

@@ -1,4 +1,5 @@
-// A plain Tcl shell, built with the same instrumentation as the libraries it loads in tests.
+// A plain Tcl shell for the tests: ktclsh, built with the same instrumentation as the libraries it
+// loads; statictclsh, with Tcl's static library linked in.
 #include <tcl.h>
 
 static int AppInit(Tcl_Interp* interp) { return Tcl_Init(interp); }

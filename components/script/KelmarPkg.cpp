@@ -75,6 +75,7 @@ void RegisterSupportFactory() {
 extern "C" {
 
 int Kelmarpkg_Init(Tcl_Interp* interp) {
+    if (Tcl_InitStubs(interp, "8.6", 0) == nullptr) return TCL_ERROR;
     static const bool registered = [] {
         Script::RegisterSupportFactory<CitI::IInterface>();
         Script::RegisterSupportFactory<HdcI::IHDProject>();

@@ -236,9 +236,12 @@ StatePtr StateOf(Tcl_Interp* interp) {
 
 }  // namespace kelmartool
 
+// The tool reaches Tcl through the stub table of the Tcl that loads it, and works with the package
+// of its own version only.
 extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp* interp) {
-    if (Tcl_PkgRequire(interp, "TcltaskI_Morvane", "1.0", 0) == nullptr) return TCL_ERROR;
-    if (kelmartool::StateOf(interp)) return TCL_OK;  // already up in this interpreter
+    if (Tcl_InitStubs(interp, "8.6", 0) == nullptr) return TCL_ERROR;
+    if (Tcl_PkgRequire(interp, "TcltaskI_Morvane", KELMAR_VERSION, 1) == nullptr) return TCL_ERROR;
+    if (kelmartool::StateOf(interp)) return Tcl_PkgProvide(interp, "KelmarTool", KELMAR_VERSION);
 
     auto* holder = new kelmartool::StatePtr(std::make_shared<kelmartool::ToolState>(interp));
     Tcl_SetAssocData(interp, kStateKey, DeleteState, holder);
@@ -270,5 +273,5 @@ extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp
     Tcl_CreateObjCommand(interp, "::kelmartool::open", OpenCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::help", HelpCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::object", ObjectCommand, nullptr, nullptr);
-    return TCL_OK;
+    return Tcl_PkgProvide(interp, "KelmarTool", KELMAR_VERSION);
 }

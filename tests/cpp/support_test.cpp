@@ -14,6 +14,22 @@ namespace {
 
 const harness::OpenFirst* const g_opened = harness::OpenFirst::Add("libTcltask_Support", {UtilI::TclPropertyID});
 
+// The library calls Tcl through its own stub table, which its entry sets from an interpreter; the
+// entry runs once the library is open.
+int g_entryResult = TCL_ERROR;
+struct RunEntry : ::testing::Environment {
+    void SetUp() override {
+        Tcl_FindExecutable(nullptr);
+        void* library = dlopen((harness::LibraryDir() + "/libTcltask_Support.so").c_str(), RTLD_NOW);
+        auto* entry = library ? reinterpret_cast<int (*)(Tcl_Interp*)>(dlsym(library, "Tcltask_support_Init")) : nullptr;
+        ASSERT_NE(entry, nullptr) << dlerror();
+        Tcl_Interp* interp = Tcl_CreateInterp();
+        g_entryResult = entry(interp);
+        Tcl_DeleteInterp(interp);
+    }
+};
+const auto* g_entry = ::testing::AddGlobalTestEnvironment(new RunEntry);
+
 // Collects the detail of every property that ends while it is in scope.
 struct DeathLog {
     DeathLog() { CitP::InstanceTable::SetObserver(&Note, this); }
@@ -52,7 +68,10 @@ protected:
     static inline Port_String message;
 };
 
-TEST(PropertyLoad, OpeningTheLibraryRegistersTheClass) { g_opened->ExpectOpeningRegistered(); }
+TEST(PropertyLoad, OpeningTheLibraryRegistersTheClassAndItsEntryRuns) {
+    g_opened->ExpectOpeningRegistered();
+    EXPECT_EQ(g_entryResult, TCL_OK);
+}
 
 TEST_F(Property, GivesBackTheValueItTook) {
     auto p = Make();

@@ -172,7 +172,11 @@ int Dispatch(ClientData data, Tcl_Interp* interp, int objc, Args objv) {
 
 extern "C" {
 
+// The kit reaches Tcl through the stub table of the Tcl that loads it, and works with the package of
+// its own version only.
 int Tcltaski_testkit_Init(Tcl_Interp* interp) {
+    if (Tcl_InitStubs(interp, "8.6", 0) == nullptr) return TCL_ERROR;
+    if (Tcl_PkgRequire(interp, "TcltaskI_Morvane", KELMAR_VERSION, 1) == nullptr) return TCL_ERROR;
     TestKit::StartWatching();
     if (!Tcl_FindNamespace(interp, "::testkit", nullptr, 0))
         Tcl_CreateNamespace(interp, "::testkit", nullptr, nullptr);
@@ -181,7 +185,7 @@ int Tcltaski_testkit_Init(Tcl_Interp* interp) {
         Tcl_CreateObjCommand(interp, name.c_str(), &TestKit::Dispatch,
                              const_cast<TestKit::Command*>(&command), nullptr);
     }
-    return TCL_OK;
+    return Tcl_PkgProvide(interp, "TcltaskI_TestKit", KELMAR_VERSION);
 }
 
 // The kit makes no file or process of its own, so a safe interpreter may have it too.

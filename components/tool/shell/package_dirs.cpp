@@ -16,7 +16,8 @@ std::string ResolvedExecutable(const std::string& fallback) {
 std::vector<std::string> PackageDirs(const std::string& executable) {
     const std::filesystem::path lib = std::filesystem::path(executable).parent_path().parent_path() / "lib";
     std::vector<std::string> dirs;
-    for (const std::filesystem::path& dir : {lib / "kelmar", lib}) {
+    // The installed package folder (lib/tcltk/kelmarVERSION), then the build tree's lib.
+    for (const std::filesystem::path& dir : {lib / "tcltk" / ("kelmar" KELMAR_VERSION), lib}) {
         std::error_code error;
         // Only a folder with an index: a bare ../lib such as /usr/lib would make Tcl's package search
         // walk every folder in it.

@@ -10,7 +10,7 @@ namespace kelmarsh {
 // `fallback` when the system does not tell.
 std::string ResolvedExecutable(const std::string& fallback);
 
-// The folders that hold the packages for a binary at `executable`: ../lib/kelmar (an installed tree)
+// The folders that hold the packages for a binary at `executable`: ../lib/tcltk/kelmarVERSION (an installed tree)
 // and ../lib (the build tree), each only when it holds a pkgIndex.tcl, the installed one first.
 std::vector<std::string> PackageDirs(const std::string& executable);
 

@@ -1,0 +1,92 @@
+#!/usr/bin/env bash
+# make install into a temporary DESTDIR: the files and where they go, that the staged tree works
+# (tclsh, kelmarsh, a C++ program through the CMake package and through pkg-config), and that the
+# uninstall leaves nothing behind.
+#   install.sh BUILD_DIR VERSION
+set -euo pipefail
+build=$(cd "$1" && pwd)
+version=$2
+here=$(cd "$(dirname "$0")" && pwd)
+source_dir=$(cd "$here/../.." && pwd)
+work=$(mktemp -d)
+stage=$work/stage
+prefix=/usr/local
+root=$stage$prefix
+package_dir=$root/lib/tcltk/kelmar$version
+design=$source_dir/examples/designs/counter.json
+
+# The install writes its manifest into the build folder: the one of a real install is kept aside.
+manifest=$build/install_manifest.txt
+[ -e "$manifest" ] && mv "$manifest" "$work/kept_manifest"
+finish() {
+    if [ -e "$work/kept_manifest" ]; then mv "$work/kept_manifest" "$manifest"; else rm -f "$manifest"; fi
+    rm -rf "$work"
+}
+trap finish EXIT
+fail() { echo "install test: $*" >&2; exit 1; }
+same() { [ "$2" == "$3" ] || fail "$1: got '$2', want '$3'"; }
+
+# The package folder is one that a stock tclsh searches for this prefix.
+paths=$(tclsh8.6 <<< 'puts [join $auto_path \n]')
+grep -qx "$prefix/lib/tcltk" <<< "$paths" || fail "$prefix/lib/tcltk is not on tclsh8.6's auto_path"
+
+DESTDIR=$stage cmake --install "$build" --prefix "$prefix" > "$work/install.log"
+mv "$manifest" "$work/manifest"
+
+# The installed files below the stage, with the build type in a file name made general.
+general() { sed 's|KelmarTargets-.*\.cmake|KelmarTargets-CONFIG.cmake|' | sort; }
+listing() { (cd "$stage" && find . ! -type d | sed 's|^\.||' | general); }
+{
+    echo "$prefix/bin/kelmarsh"
+    (cd "$source_dir/include" && find . -name '*.h' | sed "s|^\.|$prefix/include/kelmar|")
+    for f in KelmarConfig KelmarConfigVersion KelmarTargets KelmarTargets-CONFIG; do echo "$prefix/lib/cmake/Kelmar/$f.cmake"; done
+    echo "$prefix/lib/pkgconfig/kelmar.pc"
+    for f in ArgMatchKit KelmarPkg KelmarTool PortBase TcltaskI_Morvane Tcltask_Support; do
+        echo "$prefix/lib/tcltk/kelmar$version/lib$f.so"
+    done
+    echo "$prefix/lib/tcltk/kelmar$version/pkgIndex.tcl"
+} | sort > "$work/expected"
+listing | diff "$work/expected" - || fail "the installed files differ from the expected ones (< expected, > installed)"
+general < "$work/manifest" | diff "$work/expected" - || fail "the manifest lists other files"
+for library in "$package_dir"/*.so; do
+    needed=$(readelf -d "$library")
+    [[ $needed != *"[libtcl"* ]] || fail "$library needs libtcl: it must reach Tcl through the stubs"
+done
+
+# A stock tclsh, pointed at the staged tree as it would find $prefix/lib/tcltk by itself: both
+# packages load from there, each library of the package folder (the matcher's through the factory).
+cat > "$work/run.tcl" <<'EOF'
+set package [package require TcltaskI_Morvane 1.0]
+package require KelmarTool
+kelmartool::open [lindex $argv 0]
+kelmartool::collection set regs {r0 r1}
+set maps [open /proc/self/maps]
+set folders [lsort -unique [lmap {- path} [regexp -all -inline -line {\s(/\S*/lib(?:PortBase|KelmarPkg|ArgMatchKit|Tcltask_Support|TcltaskI_Morvane|KelmarTool)\.so)$} [read $maps]] {
+    file dirname $path
+}]]
+close $maps
+puts [list $package [kelmartool::collection sizeof regs] $folders]
+EOF
+want="$version 2 $package_dir"
+same "tclsh" "$(TCLLIBPATH=$root/lib/tcltk tclsh8.6 "$work/run.tcl" "$design")" "$want"
+# kelmarsh finds the packages beside itself, with no path given.
+same "kelmarsh" "$("$root/bin/kelmarsh" "$work/run.tcl" "$design")" "$want"
+
+# A C++ program against the installed headers and libraries, through find_package and pkg-config.
+cmake -S "$here" -B "$work/probe" -DCMAKE_PREFIX_PATH="$root" > "$work/probe.log"
+cmake --build "$work/probe" >> "$work/probe.log"
+want="1 1 46d2ad52-7068-4ab8-81b4-5c9aa2b2cc67"
+same "probe built with find_package(Kelmar)" "$("$work/probe/probe")" "$want"
+# shellcheck disable=SC2046  # the flags are words
+g++ -std=c++20 -Wall -Wextra -Werror "$here/probe.cpp" -o "$work/probe-pc" \
+    $(PKG_CONFIG_PATH=$root/lib/pkgconfig pkg-config --cflags --libs "kelmar = $version")
+same "probe built with pkg-config" "$("$work/probe-pc")" "$want"
+
+# Uninstall, as make uninstall does, from the manifest of this install.
+DESTDIR=$stage cmake -DMANIFEST="$work/manifest" -P "$build/uninstall.cmake" > "$work/uninstall.log"
+left=$(listing)
+[ -z "$left" ] || fail "left behind after uninstall: $left"
+for folder in lib/tcltk/kelmar$version include/kelmar lib/cmake/Kelmar; do
+    [ ! -e "$root/$folder" ] || fail "the folder $prefix/$folder is left behind"
+done
+echo "install test: passed"
