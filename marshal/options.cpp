@@ -48,14 +48,19 @@ bool RequestComponentLibraries() {
     return CitP::Factory::LoadLibraryFactory(kSupport) && CitP::Factory::LoadLibraryFactory(kArgMatch);
 }
 
-int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count) {
+int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count, const char* interfaceName,
+                        const char* word) {
+    m_interface = interfaceName;
+    m_word = word;
     const bool loaded = RequestComponentLibraries();
     m_matcher = CommonI::RefCountPtr<ICmdArgMatcher>(CitP::Factory::CreateInstanceRef(CmdArgMatcherID));
     m_matches = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));
     m_valid = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));
-    if (!loaded || !m_matcher || !m_matches || !m_valid)
-        return ReportWithoutReset(interp, "Error loading command argument matcher component library or while "
-                                          "creating the command matcher component.");
+    if (!loaded || !m_matcher || !m_matches || !m_valid) {
+        ReportWithoutReset(interp, "Error loading command argument matcher component library or while "
+                                   "creating the command matcher component.");
+        return SetFailureCode(interp, Failure::Loader, m_interface, m_word);
+    }
     for (size_t i = 0; i < count; ++i) m_valid->Add(Port_String(options[i].name));
     return 0;
 }
@@ -87,15 +92,13 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
         }
         const Port_String typed(text + 1);  // the name without its one leading dash
         CommonI::RefCountPtr<IOptionNameIterator> candidates;
-        if (m_valid->GetIterator(candidates) != 1 || !candidates)
-            return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+        if (m_valid->GetIterator(candidates) != 1 || !candidates) return MatcherFailure(interp, typed);
         CommonI::RESULT matched;
         {
             CommonI::RefCountPtr<IOptionNameSource> source(candidates);
             matched = m_matcher->Match(typed, source, m_matches);
         }
-        if (matched != 1 || !m_matches)
-            return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+        if (matched != 1 || !m_matches) return MatcherFailure(interp, typed);
         const int32_t found = m_matches->Size();
         if (found == 0) return NoMatch(interp, typed);
         if (found > 1) return Ambiguous(interp, typed);
@@ -114,14 +117,23 @@ int MatchSession::NoMatch(Tcl_Interp* interp, const Port_String& typed) {
                                  "Please specify one of the following options\n",
                                  typed.c_str());
     AppendNames(text, m_valid.get(), "   -", "\n");
-    return ReportWithoutReset(interp, text);
+    ReportWithoutReset(interp, text);
+    return SetFailureCode(interp, Failure::Option, m_interface, m_word, kOptionUnknown, Port_String("-", typed.c_str()).c_str());
+}
+
+// The matcher or its lists failed: a component fault, not a fault of the word typed.
+int MatchSession::MatcherFailure(Tcl_Interp* interp, const Port_String& typed) {
+    ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+    return SetFailureCode(interp, Failure::Loader, m_interface, m_word);
 }
 
 // The candidates are put together for the message's arguments, which its format does not show.
 int MatchSession::Ambiguous(Tcl_Interp* interp, const Port_String& typed) {
     Port_String candidates;
     AppendNames(candidates, m_matches.get(), " \"-", "\" ");
-    return ReportWithoutReset(interp, Translate("Ambiguous optional argument 'errors\n", typed.c_str(), candidates.c_str()));
+    ReportWithoutReset(interp, Translate("Ambiguous optional argument 'errors\n", typed.c_str(), candidates.c_str()));
+    return SetFailureCode(interp, Failure::Option, m_interface, m_word, kOptionAmbiguous,
+                          Port_String("-", typed.c_str()).c_str());
 }
 
 int FindOption(const char* name, const Option* options, size_t count) {
@@ -138,26 +150,36 @@ int PositionalScan(int argc, Script::Handle* const* words, const Option* options
     return argc;
 }
 
-int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord) {
-    return ErrorReport(interp, Port_String("\nFailure(s) took place while retrieving the default value for ",
-                                           "\noptional argument '", name, "' of type '", typeWord, "'"));
+int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                         const char* command) {
+    ErrorReport(interp, Port_String("\nFailure(s) took place while retrieving the default value for ",
+                                    "\noptional argument '", name, "' of type '", typeWord, "'"));
+    return SetFailureCode(interp, Failure::Default, interfaceName, command, Port_String("-", name).c_str());
 }
 
-int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord) {
-    return ErrorReport(interp,
-                       Port_String("\nOptional argument '", name, "' of type '", typeWord, "' expects a value"));
+int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                       const char* command) {
+    ErrorReport(interp, Port_String("\nOptional argument '", name, "' of type '", typeWord, "' expects a value"));
+    return SetFailureCode(interp, Failure::Option, interfaceName, command, kOptionNoValue,
+                          Port_String("-", name).c_str());
 }
 
-int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature) {
-    return ErrorReportWithHelp(interp,
-                               Port_String("The current argument \"", word,
-                                           "\" is not an optional argument switch as expected."),
-                               object, OperationName(signature).c_str());
+int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature,
+                     const char* interfaceName, const char* command) {
+    // A copy of the word: the help may run code of its own before the code is set.
+    const Port_String typed(word);
+    ErrorReportWithHelp(interp,
+                        Port_String("The current argument \"", word, "\" is not an optional argument switch as expected."),
+                        object, OperationName(signature).c_str());
+    return SetFailureCode(interp, Failure::Option, interfaceName, command, kOptionNotSwitch, typed.c_str());
 }
 
-int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature) {
-    return ErrorReportWithHelp(interp, Port_String("Unrecognized optional argument \"-", name, "\""), object,
-                               OperationName(signature).c_str());
+int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature,
+                       const char* interfaceName, const char* command) {
+    const Port_String typed("-", name);
+    ErrorReportWithHelp(interp, Port_String("Unrecognized optional argument \"", typed.c_str(), "\""), object,
+                        OperationName(signature).c_str());
+    return SetFailureCode(interp, Failure::Option, interfaceName, command, kOptionUnknown, typed.c_str());
 }
 
 }  // namespace TcltaskI

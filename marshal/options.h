@@ -38,9 +38,10 @@ public:
     MatchSession& operator=(const MatchSession&) = delete;
     ~MatchSession();
 
-    // Requests the component libraries, makes the matcher and the lists, and adds the option names.
+    // Requests the component libraries, makes the matcher and the lists, and adds the option names
+    // of the command `word` of `interfaceName`, which the error codes of its failures name.
     // 0, or 1 after the loader failure has been reported.
-    int SetUp(Tcl_Interp* interp, const Option* options, size_t count);
+    int SetUp(Tcl_Interp* interp, const Option* options, size_t count, const char* interfaceName, const char* word);
     // Fills the matched vector: words below the first option position and words without a dash stay
     // as they are, every other word becomes the full name of the one option it abbreviates.
     // 0, or 1 after the failure has been reported.
@@ -52,8 +53,11 @@ private:
 
     int NoMatch(Tcl_Interp* interp, const Port_String& typed);
     int Ambiguous(Tcl_Interp* interp, const Port_String& typed);
+    int MatcherFailure(Tcl_Interp* interp, const Port_String& typed);
     Script::Handle* MakeWord(const Port_String& name);
 
+    const char* m_interface = "";
+    const char* m_word = "";
     CommonI::RefCountPtr<ICmdArgMatcher> m_matcher;
     CommonI::RefCountPtr<IOptionNameList> m_matches;
     CommonI::RefCountPtr<IOptionNameList> m_valid;
@@ -83,9 +87,15 @@ inline const char* WordText(Script::Handle* handle) {
     return text != nullptr ? text : "";
 }
 
-int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord);
-int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord);
-int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature);
-int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature);
+// The option failures of the command `command` of `interfaceName`: the text, and the error code that
+// names the command and the option.
+int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                         const char* command);
+int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                       const char* command);
+int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature,
+                     const char* interfaceName, const char* command);
+int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature,
+                       const char* interfaceName, const char* command);
 
 }  // namespace TcltaskI
