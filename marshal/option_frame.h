@@ -86,8 +86,10 @@ struct OptionFrame {
         [[maybe_unused]] std::conditional_t<kMatched, MatchSession, std::monostate> session;
         Script::Handle* const* words = argv;
         if constexpr (kMatched) {
-            if (session.SetUp(interp, D.options.data(), N, kInterface, D.word) != 0) return 1;
-            if (session.Pass(interp, argc, argv, kFirstOption) != 0) return 1;
+            if (session.SetUp(interp, D.options.data(), N) != 0)
+                return SetFailureCode(interp, Failure::Loader, kInterface, D.word);
+            if (session.Pass(interp, argc, argv, kFirstOption) != 0)
+                return session.SetPassFailureCode(interp, kInterface, D.word);
             words = session.Vector();
         }
 

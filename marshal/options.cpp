@@ -48,19 +48,14 @@ bool RequestComponentLibraries() {
     return CitP::Factory::LoadLibraryFactory(kSupport) && CitP::Factory::LoadLibraryFactory(kArgMatch);
 }
 
-int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count, const char* interfaceName,
-                        const char* word) {
-    m_interface = interfaceName;
-    m_word = word;
+int MatchSession::SetUp(Tcl_Interp* interp, const Option* options, size_t count) {
     const bool loaded = RequestComponentLibraries();
     m_matcher = CommonI::RefCountPtr<ICmdArgMatcher>(CitP::Factory::CreateInstanceRef(CmdArgMatcherID));
     m_matches = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));
     m_valid = CommonI::RefCountPtr<IOptionNameList>(CitP::Factory::CreateInstanceRef(OptionNameListID));
-    if (!loaded || !m_matcher || !m_matches || !m_valid) {
-        ReportWithoutReset(interp, "Error loading command argument matcher component library or while "
-                                   "creating the command matcher component.");
-        return SetFailureCode(interp, Failure::Loader, m_interface, m_word);
-    }
+    if (!loaded || !m_matcher || !m_matches || !m_valid)
+        return ReportWithoutReset(interp, "Error loading command argument matcher component library or while "
+                                          "creating the command matcher component.");
     for (size_t i = 0; i < count; ++i) m_valid->Add(Port_String(options[i].name));
     return 0;
 }
@@ -100,8 +95,8 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
         }
         if (matched != 1 || !m_matches) return MatcherFailure(interp, typed);
         const int32_t found = m_matches->Size();
-        if (found == 0) return NoMatch(interp, typed);
-        if (found > 1) return Ambiguous(interp, typed);
+        if (found == 0) return NoMatch(interp, typed, text);
+        if (found > 1) return Ambiguous(interp, typed, text);
         CommonI::RefCountPtr<IOptionNameIterator> match;
         m_matches->GetIterator(match);
         match->First();
@@ -112,28 +107,34 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
     return 0;
 }
 
-int MatchSession::NoMatch(Tcl_Interp* interp, const Port_String& typed) {
+int MatchSession::NoMatch(Tcl_Interp* interp, const Port_String& typed, const char* word) {
+    m_refusal = kOptionUnknown;
+    m_refused = word;
     Port_String text = Translate("Optional argument '%s' does not match with any of valid optional arguments.\n"
                                  "Please specify one of the following options\n",
                                  typed.c_str());
     AppendNames(text, m_valid.get(), "   -", "\n");
-    ReportWithoutReset(interp, text);
-    return SetFailureCode(interp, Failure::Option, m_interface, m_word, kOptionUnknown, Port_String("-", typed.c_str()).c_str());
+    return ReportWithoutReset(interp, text);
 }
 
-// The matcher or its lists failed: a component fault, not a fault of the word typed.
 int MatchSession::MatcherFailure(Tcl_Interp* interp, const Port_String& typed) {
-    ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
-    return SetFailureCode(interp, Failure::Loader, m_interface, m_word);
+    m_refusal = nullptr;
+    return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
 }
 
 // The candidates are put together for the message's arguments, which its format does not show.
-int MatchSession::Ambiguous(Tcl_Interp* interp, const Port_String& typed) {
+int MatchSession::Ambiguous(Tcl_Interp* interp, const Port_String& typed, const char* word) {
+    m_refusal = kOptionAmbiguous;
+    m_refused = word;
     Port_String candidates;
     AppendNames(candidates, m_matches.get(), " \"-", "\" ");
-    ReportWithoutReset(interp, Translate("Ambiguous optional argument 'errors\n", typed.c_str(), candidates.c_str()));
-    return SetFailureCode(interp, Failure::Option, m_interface, m_word, kOptionAmbiguous,
-                          Port_String("-", typed.c_str()).c_str());
+    return ReportWithoutReset(interp, Translate("Ambiguous optional argument 'errors\n", typed.c_str(), candidates.c_str()));
+}
+
+// The matcher or its lists failing is a component's fault, not a fault of the word typed.
+int MatchSession::SetPassFailureCode(Tcl_Interp* interp, const char* interfaceName, const char* word) const {
+    if (m_refusal == nullptr) return SetFailureCode(interp, Failure::Loader, interfaceName, word);
+    return SetFailureCode(interp, Failure::Option, interfaceName, word, m_refusal, m_refused);
 }
 
 int FindOption(const char* name, const Option* options, size_t count) {

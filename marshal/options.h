@@ -38,26 +38,33 @@ public:
     MatchSession& operator=(const MatchSession&) = delete;
     ~MatchSession();
 
-    // Requests the component libraries, makes the matcher and the lists, and adds the option names
-    // of the command `word` of `interfaceName`, which the error codes of its failures name.
+    // Requests the component libraries, makes the matcher and the lists, and adds the option names.
     // 0, or 1 after the loader failure has been reported.
-    int SetUp(Tcl_Interp* interp, const Option* options, size_t count, const char* interfaceName, const char* word);
+    int SetUp(Tcl_Interp* interp, const Option* options, size_t count);
     // Fills the matched vector: words below the first option position and words without a dash stay
     // as they are, every other word becomes the full name of the one option it abbreviates.
     // 0, or 1 after the failure has been reported.
     int Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv, int firstOption);
+    // After Pass failed: sets the error code of its failure for the command `word` of
+    // `interfaceName`, and gives 1.
+    int SetPassFailureCode(Tcl_Interp* interp, const char* interfaceName, const char* word) const;
     Script::Handle* const* Vector() const { return m_slots; }
 
 private:
     static constexpr int kInlineWords = 16;
 
-    int NoMatch(Tcl_Interp* interp, const Port_String& typed);
-    int Ambiguous(Tcl_Interp* interp, const Port_String& typed);
+    // The failures of the matching pass; `word` is the option word as typed.
+    int NoMatch(Tcl_Interp* interp, const Port_String& typed, const char* word);
+    int Ambiguous(Tcl_Interp* interp, const Port_String& typed, const char* word);
     int MatcherFailure(Tcl_Interp* interp, const Port_String& typed);
     Script::Handle* MakeWord(const Port_String& name);
 
-    const char* m_interface = "";
-    const char* m_word = "";
+    // What a failed Pass refused: the reason of an OPTION code (null when the matcher failed) and
+    // the option word as typed. Set by the failure paths alone and read only after one of them, so
+    // that a call that succeeds does not pay for them.
+    const char* m_refusal;
+    const char* m_refused;
+
     CommonI::RefCountPtr<ICmdArgMatcher> m_matcher;
     CommonI::RefCountPtr<IOptionNameList> m_matches;
     CommonI::RefCountPtr<IOptionNameList> m_valid;
