@@ -228,7 +228,8 @@ struct OptionFrame {
 
     template <class T>
     static int OptionValueFailure(Tcl_Interp* interp, size_t k) {
-        return SetFailureCode(interp, kFetchFailure<T>, kInterface, D.word, Port_String("-", D.options[k].name).c_str());
+        return SetFailureCode(interp, kFetchFailure<T>, kInterface, D.word,
+                              Port_String("-", D.options[k].name).c_str());
     }
 };
 

@@ -169,9 +169,9 @@ int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* obj
                      const char* interfaceName, const char* command) {
     // A copy of the word: the help may run code of its own before the code is set.
     const Port_String typed(word);
-    ErrorReportWithHelp(interp,
-                        Port_String("The current argument \"", word, "\" is not an optional argument switch as expected."),
-                        object, OperationName(signature).c_str());
+    ErrorReportWithHelp(
+        interp, Port_String("The current argument \"", word, "\" is not an optional argument switch as expected."),
+        object, OperationName(signature).c_str());
     return SetFailureCode(interp, Failure::Option, interfaceName, command, kOptionNotSwitch, typed.c_str());
 }
 

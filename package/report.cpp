@@ -32,16 +32,16 @@ namespace {
 
 const char* KindWord(Failure kind) {
     switch (kind) {
-    case Failure::Count: return "COUNT";
-    case Failure::Word: return "WORD";
-    case Failure::Option: return "OPTION";
-    case Failure::Default: return "DEFAULT";
-    case Failure::Value: return "VALUE";
-    case Failure::Object: return "OBJECT";
-    case Failure::Loader: return "LOADER";
-    case Failure::Operation: return "OPERATION";
-    case Failure::Exception: return "EXCEPTION";
-    case Failure::Store: return "STORE";
+        case Failure::Count: return "COUNT";
+        case Failure::Word: return "WORD";
+        case Failure::Option: return "OPTION";
+        case Failure::Default: return "DEFAULT";
+        case Failure::Value: return "VALUE";
+        case Failure::Object: return "OBJECT";
+        case Failure::Loader: return "LOADER";
+        case Failure::Operation: return "OPERATION";
+        case Failure::Exception: return "EXCEPTION";
+        case Failure::Store: return "STORE";
     }
     return "UNKNOWN";
 }

@@ -100,7 +100,9 @@ public:
         return Opening(result, message, [&](ToolState& state, FloorplanData& fresh) -> RESULT {
             const std::string file = s1.c_str(), formWord = s2.c_str(), mode = s3.c_str();
             const auto form = FormFromWord(formWord);
-            if (!form) return Refuse(state, message, Refusal::Value, "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
+            if (!form)
+                return Refuse(state, message, Refusal::Value,
+                              "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
             if (mode != "replace" && mode != "merge")
                 return Refuse(state, message, Refusal::Value, "unknown mode '" + mode + "': use replace or merge");
             FloorplanConstraints read;
@@ -127,25 +129,30 @@ public:
             if (device.empty()) return Refuse(state, message, Refusal::Value, "the device needs a name");
             if (!WholeNumber(s3.c_str(), 1, kMaxSide, columns))
                 return Refuse(state, message, Refusal::Value,
-                            "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
+                              "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
             if (!WholeNumber(s4.c_str(), 1, kMaxSide, rows))
-                return Refuse(state, message, Refusal::Value, "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
             if (layout != "columns" && layout != "rows")
-                return Refuse(state, message, Refusal::Value, "unknown bank layout '" + layout + "': use columns or rows");
+                return Refuse(state, message, Refusal::Value,
+                              "unknown bank layout '" + layout + "': use columns or rows");
             const int stripes = layout == "columns" ? columns : rows;
             const int most = std::min(stripes, kMaxBanks);
             if (!WholeNumber(s5.c_str(), 1, most, banks))
-                return Refuse(state, message, Refusal::Value, "the banks must be a whole number from 1 to " + std::to_string(most) + ", not '" +
-                                         std::string(s5.c_str()) + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the banks must be a whole number from 1 to " + std::to_string(most) + ", not '" +
+                                  std::string(s5.c_str()) + "'");
             if (!WholeNumber(s7.c_str(), 0, kMaxCount, sso))
-                return Refuse(state, message, Refusal::Value, "the sso limit must be a whole number of at least 0, not '" +
-                                         std::string(s7.c_str()) + "'");
+                return Refuse(
+                    state, message, Refusal::Value,
+                    "the sso limit must be a whole number of at least 0, not '" + std::string(s7.c_str()) + "'");
             if (!WholeNumber(s8.c_str(), 1, kMaxCount, capacity))
                 return Refuse(state, message, Refusal::Value,
-                            "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
+                              "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
             if (!WholeNumber(s9.c_str(), 0, kMaxCount, clocks))
-                return Refuse(state, message, Refusal::Value, "the clock limit must be a whole number of at least 0, not '" +
-                                         std::string(s9.c_str()) + "'");
+                return Refuse(
+                    state, message, Refusal::Value,
+                    "the clock limit must be a whole number of at least 0, not '" + std::string(s9.c_str()) + "'");
             Device d;
             d.name = device;
             d.columns = columns;
@@ -208,7 +215,9 @@ public:
                 MergeConstraints(read, one);
                 any = true;
             }
-            if (!any) return Refuse(state, message, Refusal::Value, "nothing to import: give -ucf, -csv, -vhdl or -vlog with a file");
+            if (!any)
+                return Refuse(state, message, Refusal::Value,
+                              "nothing to import: give -ucf, -csv, -vhdl or -vlog with a file");
             // The files' blocks and prohibited sites take the place of the floorplan's; ports they do not
             // name stay where they are.
             FloorplanConstraints changed = plan.constraints;
@@ -235,11 +244,14 @@ public:
             // Every text is made and checked before any file is written; each file is then
             // replaced whole or not at all.
             const auto files = Files(ucf, csv, vhdl, vlog);
-            if (files.empty()) return Refuse(state, message, Refusal::Value, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
+            if (files.empty())
+                return Refuse(state, message, Refusal::Value,
+                              "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
             std::vector<std::string> texts(files.size()), written;
             std::string why;
             auto failed = [&](ConstraintForm form, const std::string& file) {
-                return Refuse(state, message, Refusal::File, {file}, std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
+                return Refuse(state, message, Refusal::File, {file},
+                              std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
             };
             for (std::size_t i = 0; i < files.size(); ++i)
                 if (!FormatConstraints(files[i].first, plan.constraints, state.CurrentDesign()->name, texts[i], why))
@@ -261,7 +273,8 @@ public:
             std::string error;
             TclValue value = ValueOf(cells);
             if (!value || !ResolveObjects(state, value.get(), names, error)) return Fail(message, error);
-            if (names.empty()) return Refuse(state, message, Refusal::Value, "block " + Quote(name) + " needs at least one cell");
+            if (names.empty())
+                return Refuse(state, message, Refusal::Value, "block " + Quote(name) + " needs at least one cell");
             const Design& design = *state.CurrentDesign();
             FloorplanConstraints changed = plan.constraints;
             auto it = std::find_if(changed.blocks.begin(), changed.blocks.end(),
@@ -276,7 +289,8 @@ public:
                 for (const Block& other : changed.blocks)
                     if (other.name != name &&
                         std::find(other.cells.begin(), other.cells.end(), cell) != other.cells.end())
-                        return Refuse(state, message, Refusal::Value, "cell " + Quote(cell) + " is in block " + Quote(other.name) + " already");
+                        return Refuse(state, message, Refusal::Value,
+                                      "cell " + Quote(cell) + " is in block " + Quote(other.name) + " already");
                 if (std::find(it->cells.begin(), it->cells.end(), cell) == it->cells.end()) it->cells.push_back(cell);
             }
             if (!Answer(NewList(it->cells), result, message)) return 0;
@@ -335,11 +349,13 @@ public:
                 changed.name = text;
             } else if (key == "site_capacity") {
                 if (!WholeNumber(text, 1, kMaxCount, number))
-                    return Refuse(state, message, Refusal::Value, "the site capacity must be a whole number from 1, not '" + text + "'");
+                    return Refuse(state, message, Refusal::Value,
+                                  "the site capacity must be a whole number from 1, not '" + text + "'");
                 changed.device.siteCapacity = number;
             } else if (key == "clock_limit") {
                 if (!WholeNumber(text, 0, kMaxCount, number))
-                    return Refuse(state, message, Refusal::Value, "the clock limit must be a whole number of at least 0, not '" + text + "'");
+                    return Refuse(state, message, Refusal::Value,
+                                  "the clock limit must be a whole number of at least 0, not '" + text + "'");
                 changed.clockLimit = number;
             } else if (WholeNumber(text, 0, kMaxCount, number)) {
                 for (Bank& b : changed.device.banks) b.ssoLimit = number;
@@ -348,15 +364,17 @@ public:
                 const auto words = Words(text);
                 if (words.empty() || words.size() % 2 != 0)
                     return Refuse(state, message, Refusal::Value,
-                                "the sso limit is a whole number for every bank, or a dict of bank and number");
+                                  "the sso limit is a whole number for every bank, or a dict of bank and number");
                 for (std::size_t i = 0; i < words.size(); i += 2) {
                     auto bank = std::find_if(changed.device.banks.begin(), changed.device.banks.end(),
                                              [&](const Bank& b) { return b.name == words[i]; });
                     if (bank == changed.device.banks.end())
-                        return Refuse(state, message, Refusal::Unknown, {"BANK", words[i]}, Quote(words[i]) + " is no bank of the device");
+                        return Refuse(state, message, Refusal::Unknown, {"BANK", words[i]},
+                                      Quote(words[i]) + " is no bank of the device");
                     if (!WholeNumber(words[i + 1], 0, kMaxCount, bank->ssoLimit))
-                        return Refuse(state, message, Refusal::Value, "the sso limit of " + Quote(words[i]) +
-                                                 " must be a whole number of at least 0, not '" + words[i + 1] + "'");
+                        return Refuse(state, message, Refusal::Value,
+                                      "the sso limit of " + Quote(words[i]) +
+                                          " must be a whole number of at least 0, not '" + words[i + 1] + "'");
                 }
             }
             if (!Answer(FloorplanProperty(state, changed, key), result, message)) return 0;
@@ -383,8 +401,9 @@ public:
                 std::find(kBlockProperties.begin(), kBlockProperties.end(), key) != kBlockProperties.end();
             for (const std::string& n : names)
                 if (!builtIn && !FindBlock(plan, n)->constraints.count(key))
-                    return Refuse(state, message, Refusal::Unknown, {"PROPERTY", key}, "block " + Quote(n) + " has no property or constraint " + Quote(key) +
-                                             "; its properties are " + Join(kBlockProperties));
+                    return Refuse(state, message, Refusal::Unknown, {"PROPERTY", key},
+                                  "block " + Quote(n) + " has no property or constraint " + Quote(key) +
+                                      "; its properties are " + Join(kBlockProperties));
             auto valueOf = [&](const std::string& n) {
                 const Block& b = *FindBlock(plan, n);
                 return builtIn ? BlockProperty(plan, b, key) : NewText(b.constraints.at(key));
@@ -402,7 +421,8 @@ public:
             std::vector<std::string> names;
             if (!BlockNames(state, plan, block, names, message)) return 0;
             const std::string key = name.c_str(), text = value.c_str();
-            if (std::string problem = CheckBlockConstraint(key, text); !problem.empty()) return Refuse(state, message, Refusal::Value, problem);
+            if (std::string problem = CheckBlockConstraint(key, text); !problem.empty())
+                return Refuse(state, message, Refusal::Value, problem);
             FloorplanConstraints changed = plan.constraints;
             for (Block& b : changed.blocks) {
                 if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
@@ -429,7 +449,9 @@ public:
             for (Block& b : changed.blocks) {
                 if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
                 const bool had = key == "region" ? RegionOf(b).has_value() : b.constraints.erase(key) > 0;
-                if (!had) return Refuse(state, message, Refusal::Unknown, {"CONSTRAINT", key}, "block " + Quote(b.name) + " has no constraint " + Quote(key));
+                if (!had)
+                    return Refuse(state, message, Refusal::Unknown, {"CONSTRAINT", key},
+                                  "block " + Quote(b.name) + " has no constraint " + Quote(key));
                 if (key == "region") SetRegion(b, std::nullopt);
             }
             return AnswerBlocks(plan, std::move(changed), names, result, message);
@@ -457,26 +479,31 @@ public:
         return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             const auto from = Words(s1.c_str()), to = Words(s2.c_str()), offset = Words(s3.c_str());
             const std::string mode = s4.c_str();
-            if (mode != "copy" && mode != "swap") return Refuse(state, message, Refusal::Value, "unknown mode '" + mode + "': use copy or swap");
+            if (mode != "copy" && mode != "swap")
+                return Refuse(state, message, Refusal::Value, "unknown mode '" + mode + "': use copy or swap");
             if (from.empty() || from.size() != to.size())
-                return Refuse(state, message, Refusal::Value, "the two port lists must be of the same length, and not empty");
+                return Refuse(state, message, Refusal::Value,
+                              "the two port lists must be of the same length, and not empty");
             int dx = 0, dy = 0;
             if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -kMaxSide, kMaxSide, dx) ||
                                     !WholeNumber(offset[1], -kMaxSide, kMaxSide, dy)))
                 return Refuse(state, message, Refusal::Value,
-                            "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
+                              "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
             if (mode == "swap" && (dx != 0 || dy != 0))
                 return Refuse(state, message, Refusal::Value, "swap moves no pin by an offset: give \"0 0\"");
             const Design& design = *state.CurrentDesign();
             std::set<std::string> seen;
             for (const std::string& p : from) seen.insert(p);
             for (const std::string& p : to)
-                if (!seen.insert(p).second) return Refuse(state, message, Refusal::Value, "port " + Quote(p) + " is named twice");
+                if (!seen.insert(p).second)
+                    return Refuse(state, message, Refusal::Value, "port " + Quote(p) + " is named twice");
             auto sites = plan.constraints.ports;
             DictBuilder moved;
             for (std::size_t i = 0; i < from.size(); ++i) {
                 for (const std::string* p : {&from[i], &to[i]})
-                    if (!design.FindPort(*p)) return Refuse(state, message, Refusal::Unknown, {"PORT", *p}, Quote(*p) + " is no port of the design");
+                    if (!design.FindPort(*p))
+                        return Refuse(state, message, Refusal::Unknown, {"PORT", *p},
+                                      Quote(*p) + " is no port of the design");
                 const auto source = plan.constraints.ports.find(from[i]);
                 if (source == plan.constraints.ports.end())
                     return Refuse(state, message, Refusal::Value, "port " + Quote(from[i]) + " is not placed");
@@ -491,20 +518,23 @@ public:
                 int x = 0, y = 0;
                 ParseSiteName(source->second, x, y);
                 if (!plan.device.OnDevice(x + dx, y + dy))
-                    return Refuse(state, message, Refusal::Value, "port " + Quote(to[i]) + " would leave the device: " + source->second +
-                                             " moved by " + std::to_string(dx) + " " + std::to_string(dy));
+                    return Refuse(state, message, Refusal::Value,
+                                  "port " + Quote(to[i]) + " would leave the device: " + source->second + " moved by " +
+                                      std::to_string(dx) + " " + std::to_string(dy));
                 sites[to[i]] = Device::SiteName(x + dx, y + dy);
             }
             std::map<std::string, std::string> holder;  // site -> port
             for (const auto& [port, site] : sites) {
                 auto [it, fresh] = holder.emplace(site, port);
                 if (!fresh)
-                    return Refuse(state, message, Refusal::Value,
-                                "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
+                    return Refuse(
+                        state, message, Refusal::Value,
+                        "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
                 const auto before = plan.constraints.ports.find(port);
                 const bool changed = before == plan.constraints.ports.end() || before->second != site;
                 if (changed && plan.constraints.prohibited.count(site))
-                    return Refuse(state, message, Refusal::Value, "port " + Quote(port) + " would be placed on the prohibited site " + site);
+                    return Refuse(state, message, Refusal::Value,
+                                  "port " + Quote(port) + " would be placed on the prohibited site " + site);
                 if (changed) moved.Add(port, site);
             }
             if (!Answer(moved.Take(), result, message)) return 0;
@@ -524,13 +554,14 @@ public:
                 const Block* block = FindBlock(plan, b);
                 if (!block) return Refuse(state, message, Refusal::Unknown, {"BLOCK", b}, "no block named " + Quote(b));
                 const auto region = RegionOf(*block);
-                if (!region) return Refuse(state, message, Refusal::Value, "block " + Quote(b) + " has no region to show");
+                if (!region)
+                    return Refuse(state, message, Refusal::Value, "block " + Quote(b) + " has no region to show");
                 view = ClampToDevice(*region, plan.device);
             } else {
                 const auto p = plan.device.ParseSite(a), q = plan.device.ParseSite(b);
                 if (!p || !q)
                     return Refuse(state, message, Refusal::Value,
-                                "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
+                                  "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
                 view = Region{std::min(p->x, q->x), std::min(p->y, q->y), std::max(p->x, q->x), std::max(p->y, q->y)};
             }
             if (!Answer(ViewValue(plan, view), result, message)) return 0;
@@ -576,7 +607,8 @@ private:
             return nullptr;
         }
         if (plan.epoch != state.designEpoch) {
-            Refuse(state, message, Refusal::State, "the design changed since the floorplan was opened: close it with -nosave and open it again");
+            Refuse(state, message, Refusal::State,
+                   "the design changed since the floorplan was opened: close it with -nosave and open it again");
             return nullptr;
         }
         return &plan;
@@ -604,7 +636,8 @@ private:
 
     // A floorplan made from the current design, when none is open yet.
     static bool Start(ToolState& state, FloorplanData& fresh, Msg& message) {
-        if (Plan(state).open) return Refuse(state, message, Refusal::State, "the floorplan is open already: close it first") != 0;
+        if (Plan(state).open)
+            return Refuse(state, message, Refusal::State, "the floorplan is open already: close it first") != 0;
         const Design* design = state.CurrentDesign();
         if (!design) return Refuse(state, message, Refusal::NoProject, kNoProject) != 0;
         fresh.open = true;
@@ -643,8 +676,9 @@ private:
         for (const Block& b : plan->constraints.blocks)
             if (auto r = RegionOf(b);
                 r && !(plan->device.OnDevice(r->x0, r->y0) && plan->device.OnDevice(r->x1, r->y1)))
-                return Refuse(state, message, Refusal::Value, "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
-                                         RegionText(*r) + ", which reaches beyond the device") != 0;
+                return Refuse(state, message, Refusal::Value,
+                              "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
+                                  RegionText(*r) + ", which reaches beyond the device") != 0;
         const Design& before = *project->GetDesign();
         Design design = before;
         design.device = plan->device;
@@ -669,7 +703,8 @@ private:
         if (std::string problem = design.Index(); !problem.empty())
             return Refuse(state, message, Refusal::Value, "the floorplan cannot be saved: " + problem) != 0;
         if (std::string problem; !project->Store(std::move(design), saved.changed, problem))
-            return Refuse(state, message, Refusal::File, {project->File()}, "the floorplan cannot be saved: " + problem) != 0;
+            return Refuse(state, message, Refusal::File, {project->File()},
+                          "the floorplan cannot be saved: " + problem) != 0;
         saved.file = project->File();
         if (moved) state.DesignChanged();
         plan->epoch = state.designEpoch;
@@ -691,7 +726,7 @@ private:
 
     static RESULT Unknown(const ToolState& state, const std::string& key, Msg& message) {
         return Refuse(state, message, Refusal::Unknown, {"SETTING", key},
-                    "no floorplan setting '" + key + "'; the settings are: open, " + Join(kFloorplanProperties));
+                      "no floorplan setting '" + key + "'; the settings are: open, " + Join(kFloorplanProperties));
     }
 
     static const Block* FindBlock(const FloorplanData& plan, const std::string& name) {
@@ -707,9 +742,10 @@ private:
         for (const std::string& n : names)
             if (!FindBlock(plan, n)) {
                 const auto all = BlockList(plan.constraints);
-                return Refuse(state, message, Refusal::Unknown, {"BLOCK", n}, "no block named " + Quote(n) +
-                                         (all.empty() ? std::string("; the floorplan has no blocks")
-                                                      : "; the blocks are: " + Join(all))) != 0;
+                return Refuse(state, message, Refusal::Unknown, {"BLOCK", n},
+                              "no block named " + Quote(n) +
+                                  (all.empty() ? std::string("; the floorplan has no blocks")
+                                               : "; the blocks are: " + Join(all))) != 0;
             }
         return true;
     }
@@ -748,11 +784,13 @@ private:
                 const bool range = w.find(':') != std::string::npos;
                 int x = 0, y = 0;
                 if (range ? !ParseRegion(w, r, error) : !ParseSiteName(w, x, y))
-                    return Refuse(state, message, Refusal::Value, Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
+                    return Refuse(state, message, Refusal::Value,
+                                  Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
                 if (!range) r = Region{x, y, x, y};
                 if (!plan.device.OnDevice(r.x0, r.y0) || !plan.device.OnDevice(r.x1, r.y1))
-                    return Refuse(state, message, Refusal::Value, Quote(w) + " is not on the device (" + std::to_string(plan.device.columns) +
-                                             " x " + std::to_string(plan.device.rows) + " sites)");
+                    return Refuse(state, message, Refusal::Value,
+                                  Quote(w) + " is not on the device (" + std::to_string(plan.device.columns) + " x " +
+                                      std::to_string(plan.device.rows) + " sites)");
                 if (!prohibit) {
                     // A walk over what is prohibited, not over the range, which may be huge.
                     std::erase_if(changed, [&r](const std::string& site) {
@@ -762,14 +800,16 @@ private:
                     continue;
                 }
                 if (r.Sites() > kMaxProhibited)
-                    return Refuse(state, message, Refusal::Limit, Quote(w) + " covers " + std::to_string(r.Sites()) +
-                                             " sites; a floorplan prohibits at most " +
-                                             std::to_string(kMaxProhibited) + " sites");
+                    return Refuse(state, message, Refusal::Limit,
+                                  Quote(w) + " covers " + std::to_string(r.Sites()) +
+                                      " sites; a floorplan prohibits at most " + std::to_string(kMaxProhibited) +
+                                      " sites");
                 for (int yy = r.y0; yy <= r.y1; ++yy)
                     for (int xx = r.x0; xx <= r.x1; ++xx) changed.insert(Device::SiteName(xx, yy));
                 if (static_cast<long long>(changed.size()) > kMaxProhibited)
-                    return Refuse(state, message, Refusal::Limit, "the floorplan would prohibit " + std::to_string(changed.size()) +
-                                             " sites, more than " + std::to_string(kMaxProhibited));
+                    return Refuse(state, message, Refusal::Limit,
+                                  "the floorplan would prohibit " + std::to_string(changed.size()) +
+                                      " sites, more than " + std::to_string(kMaxProhibited));
             }
             if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
             plan.constraints.prohibited = std::move(changed);

@@ -22,8 +22,8 @@ Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors) {
     });
 }
 
-CommonI::RESULT SetSetting(const ToolState& state, SettingTable& table, const std::string& name, const std::string& text,
-                           bool allowNew, UtilI::MITclProperty& result, Port_String& message) {
+CommonI::RESULT SetSetting(const ToolState& state, SettingTable& table, const std::string& name,
+                           const std::string& text, bool allowNew, UtilI::MITclProperty& result, Port_String& message) {
     if (std::string error = table.Set(name, text, allowNew); !error.empty()) {
         if (!allowNew && table.Find(name) == nullptr)
             return Refuse(state, message, Refusal::Unknown, {"SETTING", name}, error);
@@ -32,11 +32,12 @@ CommonI::RESULT SetSetting(const ToolState& state, SettingTable& table, const st
     return Answer(NewText(table.Find(name)->value), result, message);
 }
 
-CommonI::RESULT GetSetting(const ToolState& state, const SettingTable& table, const std::string& name,
-                           const char* what, UtilI::MITclProperty& result, Port_String& message) {
+CommonI::RESULT GetSetting(const ToolState& state, const SettingTable& table, const std::string& name, const char* what,
+                           UtilI::MITclProperty& result, Port_String& message) {
     const Setting* setting = table.Find(name);
     if (setting == nullptr)
-        return Refuse(state, message, Refusal::Unknown, {"SETTING", name}, std::string("unknown ") + what + " '" + name + "'");
+        return Refuse(state, message, Refusal::Unknown, {"SETTING", name},
+                      std::string("unknown ") + what + " '" + name + "'");
     return Answer(NewText(setting->value), result, message);
 }
 

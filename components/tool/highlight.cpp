@@ -64,14 +64,17 @@ private:
         std::string colour = color.c_str();
         if (colour.empty()) colour = m_state->highlightSettings.Find("default_highlight_color")->value;
         auto canonical = CanonicalColor(colour);
-        if (!canonical) return Refuse(*m_state, message, Refusal::Value, "bad colour '" + colour + "': expected a colour name or #rrggbb");
+        if (!canonical)
+            return Refuse(*m_state, message, Refusal::Value,
+                          "bad colour '" + colour + "': expected a colour name or #rrggbb");
         std::vector<std::string> names;
         if (!ResolveItems(*m_state, items, names, message)) return 0;
         auto marked = replace ? std::map<std::string, std::string>{} : m_state->highlight;
         for (const std::string& name : names) marked[name] = *canonical;
         if (std::size_t limit = MaxItems(m_state->highlightSettings); limit != 0 && marked.size() > limit)
-            return Refuse(*m_state, message, Refusal::Limit, "the highlight would hold " + std::to_string(marked.size()) + " objects, more than max_items " +
-                                     std::to_string(limit));
+            return Refuse(*m_state, message, Refusal::Limit,
+                          "the highlight would hold " + std::to_string(marked.size()) +
+                              " objects, more than max_items " + std::to_string(limit));
         m_state->highlight = std::move(marked);
         return Answer(NewInt(static_cast<long long>(m_state->highlight.size())), result, message);
     }

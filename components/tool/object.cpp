@@ -81,7 +81,8 @@ public:
         const Properties all = *m_state->CurrentDesign()->PropertiesOf(found);
         auto it = all.find(property.c_str());
         if (it == all.end())
-            return Refuse(*m_state, message, Refusal::Unknown, {"PROPERTY", property.c_str()}, "object '" + found + "' has no property '" + property.c_str() + "'");
+            return Refuse(*m_state, message, Refusal::Unknown, {"PROPERTY", property.c_str()},
+                          "object '" + found + "' has no property '" + property.c_str() + "'");
         return Answer(NewText(it->second), result, message);
     }
 
@@ -122,7 +123,8 @@ private:
         TclValue value(NewText(text));
         if (!ResolveObjects(*m_state, value.get(), names, error)) return Fail(message, error);
         if (names.size() != 1)
-            return Refuse(*m_state, message, Refusal::Value, "expected one object, but '" + text + "' names " + std::to_string(names.size()));
+            return Refuse(*m_state, message, Refusal::Value,
+                          "expected one object, but '" + text + "' names " + std::to_string(names.size()));
         found = names.front();
         return true;
     }

@@ -81,13 +81,13 @@ namespace {
 
 const char* RefusalWord(Refusal kind) {
     switch (kind) {
-    case Refusal::NoProject: return "NOPROJECT";
-    case Refusal::Unknown: return "UNKNOWN";
-    case Refusal::File: return "FILE";
-    case Refusal::State: return "STATE";
-    case Refusal::Limit: return "LIMIT";
-    case Refusal::Value: return "VALUE";
-    case Refusal::Script: return "SCRIPT";
+        case Refusal::NoProject: return "NOPROJECT";
+        case Refusal::Unknown: return "UNKNOWN";
+        case Refusal::File: return "FILE";
+        case Refusal::State: return "STATE";
+        case Refusal::Limit: return "LIMIT";
+        case Refusal::Value: return "VALUE";
+        case Refusal::Script: return "SCRIPT";
     }
     return "VALUE";
 }

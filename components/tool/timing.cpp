@@ -247,9 +247,11 @@ public:
         return m_state.On(message, [&](ToolState& state) -> RESULT {
             const std::string id = analysis.c_str();
             if (id.empty() || id.find_first_of(" \t\n") != std::string::npos)
-                return Refuse(state, message, Refusal::Value, "the name of a timing analysis must be one word, not '" + id + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the name of a timing analysis must be one word, not '" + id + "'");
             TimingData& data = Data(state);
-            if (data.analyses.count(id)) return Refuse(state, message, Refusal::Value, "a timing analysis named '" + id + "' exists already");
+            if (data.analyses.count(id))
+                return Refuse(state, message, Refusal::Value, "a timing analysis named '" + id + "' exists already");
             Analysis a;
             a.id = id;
             a.name = name.IsEmpty() ? id : std::string(name.c_str());
@@ -272,8 +274,9 @@ public:
             const Design* design = state.CurrentDesign();
             if (!design) return Refuse(state, message, Refusal::NoProject, kNoProject);
             if (a.result && !overwrite)
-                return Refuse(state, message, Refusal::State, "timing analysis '" + a.id +
-                                         "' has a result already: run it with -overwrite to replace the result");
+                return Refuse(state, message, Refusal::State,
+                              "timing analysis '" + a.id +
+                                  "' has a result already: run it with -overwrite to replace the result");
             const int pathLimit = static_cast<int>(state.settings.Integer("max_paths", 0));
             TimingResult fresh;
             std::string error;
@@ -307,7 +310,8 @@ public:
             if (!target) {
                 for (const Descriptor& d : kSettings)
                     if (key == d.name)
-                        return Refuse(state, message, Refusal::Value, "the setting '" + key + "' of a timing analysis is read-only");
+                        return Refuse(state, message, Refusal::Value,
+                                      "the setting '" + key + "' of a timing analysis is read-only");
                 return UnknownSetting(state, key, message);
             }
             if (key == "name" && text.empty())
@@ -335,11 +339,13 @@ public:
                          Msg& message) override {
         return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             const std::string k = kind.c_str(), s = side.c_str();
-            if (k != "from" && k != "to") return Refuse(state, message, Refusal::Value, "unknown endpoint kind '" + k + "': use from or to");
+            if (k != "from" && k != "to")
+                return Refuse(state, message, Refusal::Value, "unknown endpoint kind '" + k + "': use from or to");
             if (s != "only" && s != "except")
                 return Refuse(state, message, Refusal::Value, "unknown endpoint side '" + s + "': use only or except");
             std::vector<std::string> items;
-            if (!WordsOf(endpoints, items)) return Refuse(state, message, Refusal::Value, "the endpoints are no proper list");
+            if (!WordsOf(endpoints, items))
+                return Refuse(state, message, Refusal::Value, "the endpoints are no proper list");
             const Design* design = state.CurrentDesign();
             if (!design) return Refuse(state, message, Refusal::NoProject, kNoProject);
             for (const std::string& item : items) {
@@ -347,11 +353,13 @@ public:
                 const IoPort* port = design->FindPort(item);
                 const bool fits = (cell && cell->sequential) || (port && port->output == (k == "to"));
                 if (!fits)
-                    return Refuse(state, message, Refusal::Value, "'" + item + "' is no " + (k == "from" ? "start" : "end") + " point: use " +
-                                             (k == "from" ? "input" : "output") + " ports and sequential cells");
+                    return Refuse(state, message, Refusal::Value,
+                                  "'" + item + "' is no " + (k == "from" ? "start" : "end") + " point: use " +
+                                      (k == "from" ? "input" : "output") + " ports and sequential cells");
             }
             if (items.empty() && s == "only")
-                return Refuse(state, message, Refusal::Value, "set_endpoints " + k + " only needs at least one endpoint");
+                return Refuse(state, message, Refusal::Value,
+                              "set_endpoints " + k + " only needs at least one endpoint");
             TimingSettings changed = a.settings;
             if (items.empty())
                 changed.endpoints.erase(k);
@@ -369,14 +377,18 @@ public:
                 return Refuse(state, message, Refusal::Value, "unknown query kind '" + k + "': use paths or fanout");
             if (ld < 0 || hf < 0) return Refuse(state, message, Refusal::Value, "-ld and -hf cannot be negative");
             std::vector<std::string> words;
-            if (!WordsOf(items, words)) return Refuse(state, message, Refusal::Value, "the query items are no proper list");
-            if (words.empty()) return Refuse(state, message, Refusal::Value, "a " + k + " query needs at least one item");
+            if (!WordsOf(items, words))
+                return Refuse(state, message, Refusal::Value, "the query items are no proper list");
+            if (words.empty())
+                return Refuse(state, message, Refusal::Value, "a " + k + " query needs at least one item");
             if (k == "paths") {
                 for (const std::string& w : words)
                     if (w != "*" && std::find(kPathFields.begin(), kPathFields.end(), w) == kPathFields.end())
-                        return Refuse(state, message, Refusal::Value, "unknown path field '" + w + "': use * or " + Join(kPathFields));
+                        return Refuse(state, message, Refusal::Value,
+                                      "unknown path field '" + w + "': use * or " + Join(kPathFields));
             } else if (hf < 1) {
-                return Refuse(state, message, Refusal::Value, "a fanout query needs -hf N, the least fanout it reports");
+                return Refuse(state, message, Refusal::Value,
+                              "a fanout query needs -hf N, the least fanout it reports");
             }
             TimingSettings changed = a.settings;
             changed.queries[k] = TimingSettings::Query{words, ld, hf};
@@ -393,10 +405,12 @@ public:
                 return Refuse(state, message, Refusal::Value, "unknown filter kind '" + k + "': use " + Join(kinds));
             const bool slack = k == "slack";
             if (m != "clear" && (slack ? m != "below" && m != "above" : m != "include" && m != "exclude"))
-                return Refuse(state, message, Refusal::Value, "unknown mode '" + m + "' of the " + k + " filter: use " +
-                                         (slack ? "below, above or clear" : "include, exclude or clear"));
+                return Refuse(state, message, Refusal::Value,
+                              "unknown mode '" + m + "' of the " + k + " filter: use " +
+                                  (slack ? "below, above or clear" : "include, exclude or clear"));
             std::vector<std::string> words;
-            if (!WordsOf(items, words)) return Refuse(state, message, Refusal::Value, "the filter items are no proper list");
+            if (!WordsOf(items, words))
+                return Refuse(state, message, Refusal::Value, "the filter items are no proper list");
             TimingSettings changed = a.settings;
             if (m == "clear") {
                 changed.filters.erase(k);
@@ -404,7 +418,8 @@ public:
                 double bound = 0;
                 if (slack && (words.size() != 1 || !IsNumber(words.front(), bound)))
                     return Refuse(state, message, Refusal::Value, "the slack filter needs one number");
-                if (words.empty()) return Refuse(state, message, Refusal::Value, "the " + k + " filter needs at least one pattern");
+                if (words.empty())
+                    return Refuse(state, message, Refusal::Value, "the " + k + " filter needs at least one pattern");
                 if (slack) words.front() = Number(bound);
                 changed.filters[k] = TimingSettings::Filter{m, words};
             }
@@ -440,15 +455,16 @@ private:
         std::vector<std::string> ids;
         for (const auto& [id, a] : data.analyses) ids.push_back(id);
         Refuse(state, message, Refusal::Unknown, {"ANALYSIS", analysis.c_str()},
-             "no timing analysis named '" + std::string(analysis.c_str()) + "'" +
-                 (ids.empty() ? std::string(": make one with timing new NAME") : "; the analyses are: " + Join(ids)));
+               "no timing analysis named '" + std::string(analysis.c_str()) + "'" +
+                   (ids.empty() ? std::string(": make one with timing new NAME") : "; the analyses are: " + Join(ids)));
         return nullptr;
     }
 
     static RESULT UnknownSetting(const ToolState& state, const std::string& key, Msg& message) {
         std::vector<std::string> names;
         for (const Descriptor& d : kSettings) names.push_back(d.name);
-        return Refuse(state, message, Refusal::Unknown, {"SETTING", key}, "no setting '" + key + "' in a timing analysis; the settings are: " + Join(names));
+        return Refuse(state, message, Refusal::Unknown, {"SETTING", key},
+                      "no setting '" + key + "' in a timing analysis; the settings are: " + Join(names));
     }
 
     static Tcl_Obj* Settings(const ToolState& state, const Analysis& a) {
@@ -524,12 +540,14 @@ private:
     RESULT SwitchConstraints(const Str& analysis, const List& constraints, bool enabled, Out& result, Msg& message) {
         return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             std::vector<std::string> names;
-            if (!WordsOf(constraints, names)) return Refuse(state, message, Refusal::Value, "the constraint names are no proper list");
+            if (!WordsOf(constraints, names))
+                return Refuse(state, message, Refusal::Value, "the constraint names are no proper list");
             TimingSettings changed = a.settings;
             for (const std::string& n : names) {
                 auto it = changed.constraints.find(n);
                 if (it == changed.constraints.end())
-                    return Refuse(state, message, Refusal::Unknown, {"CONSTRAINT", n}, "timing analysis '" + a.id + "' has no constraint '" + n + "'");
+                    return Refuse(state, message, Refusal::Unknown, {"CONSTRAINT", n},
+                                  "timing analysis '" + a.id + "' has no constraint '" + n + "'");
                 it->second.enabled = enabled;
             }
             return Commit(a, std::move(changed), ConstraintsValue, result, message);
@@ -551,7 +569,8 @@ private:
             auto& set = changed.disabled[k];
             for (const std::string& w : words) {
                 const auto ref = design->Find(w);
-                if (!ref || ref->kind != *objectKind) return Refuse(state, message, Refusal::Value, "'" + w + "' is no " + k + " of the design");
+                if (!ref || ref->kind != *objectKind)
+                    return Refuse(state, message, Refusal::Value, "'" + w + "' is no " + k + " of the design");
                 if (enabled)
                     set.erase(w);
                 else
@@ -564,7 +583,9 @@ private:
 
     RESULT WriteReport(const Str& analysis, const Str& file, Out& result, Msg& message) {
         return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
-            if (!a.result) return Refuse(state, message, Refusal::State, "timing analysis '" + a.id + "' has no result: run it first");
+            if (!a.result)
+                return Refuse(state, message, Refusal::State,
+                              "timing analysis '" + a.id + "' has no result: run it first");
             const std::string path = file.c_str();
             if (path.empty()) return Refuse(state, message, Refusal::Value, "the report needs a file name");
             std::ostringstream text;
@@ -590,7 +611,8 @@ private:
                 for (const FanoutNet& n : r.highFanout) text << "  " << n.net << " " << n.fanout << "\n";
             }
             if (std::string why; !WriteTextFile(path, text.str(), why))
-                return Refuse(state, message, Refusal::File, {path}, "cannot write the timing report to '" + path + "': " + why);
+                return Refuse(state, message, Refusal::File, {path},
+                              "cannot write the timing report to '" + path + "': " + why);
             return Answer(NewText(path), result, message);
         });
     }
