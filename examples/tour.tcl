@@ -20,21 +20,6 @@ proc step {command} {
     }
 }
 
-# Prints a dict one key a line.
-proc table {title dict} {
-    puts "  $title"
-    dict for {key value} $dict { puts [format "    %-16s %s" $key $value] }
-}
-
-# Prints the worst paths of a timing run, one a line.
-proc paths {paths} {
-    foreach path $paths {
-        puts [format "    %-6s -> %-6s arrival %4s  required %4s  slack %4s   through %s" \
-            [dict get $path startpoint] [dict get $path endpoint] [dict get $path arrival] \
-            [dict get $path required] [dict get $path slack] [dict get $path points]]
-    }
-}
-
 proc section {title} { puts "\n== $title" }
 
 set design [file tail [project GetFileName]]
@@ -69,12 +54,12 @@ section "Object queries"
 step {obj type r0}
 step {obj get r0 cell_type}
 step {obj get q0_n loads}
-table "obj properties sys_clk" [obj properties sys_clk]
+step {kelmartool::report dict [obj properties sys_clk]}
 step {lindex [obj properties u_inc0 -descriptors] 0}
 step {obj get nosuch site}
 
 section "Global settings"
-table "settings properties" [settings properties]
+step {kelmartool::report dict [settings properties]}
 step {settings set max_paths 3}
 step {settings set max_paths many}
 step {settings set my_note "set by the tour"}
@@ -139,12 +124,10 @@ step {view pan -farleft -top}
 
 section "Timing analysis"
 step {timing new setup -name "counter at 100 MHz"}
-puts "% timing run setup"
-paths [timing run setup]
+step {kelmartool::report paths [timing run setup]}
 step {timing get setup worst_slack}
 step {timing set_constraint setup period:sys_clk 4.5}
-puts "% timing run setup -overwrite"
-paths [timing run setup -overwrite]
+step {kelmartool::report paths [timing run setup -overwrite]}
 step {timing get setup worst_slack}
 step {timing get setup failing}
 step {timing save_as setup [file join $scratch setup.rpt]}
@@ -157,11 +140,11 @@ step {floorplan block_properties}
 step {floorplan group blk_out {u_carry}}
 step {floorplan block_set_constraint blk_out region X4Y4:X4Y4}
 step {floorplan prohibit {X4Y4}}
-step {floorplan drc}
+step {kelmartool::report drc [floorplan drc]}
 step {floorplan allow {X4Y4}}
 step {floorplan drc}
-step {floorplan sso_analysis}
-step {floorplan clock_analysis}
+step {kelmartool::report sso [floorplan sso_analysis]}
+step {kelmartool::report clocks [floorplan clock_analysis]}
 step {floorplan export -csv [file join $scratch plan.csv]}
 step {floorplan close -nosave}
 

@@ -74,15 +74,22 @@ struct OptionFrame {
     static constexpr int kFirstOption = 2 + static_cast<int>(R);
     static_assert(static_cast<size_t>(D.required) == R, "the row's required count must match the operation");
 
+    static constexpr const char* kInterface = I::NAME;
+
     static int Run(W& self, int argc, Script::Handle* const* argv, Tcl_Interp* interp) {
         I* object = nullptr;
-        if (self.Object(&object) != 0) return ErrorReport(interp, MethodText(kNoObjectText, W::kClassName, D.word));
+        if (self.Object(&object) != 0) {
+            ErrorReport(interp, MethodText(kNoObjectText, W::kClassName, D.word));
+            return SetFailureCode(interp, Failure::Object, kInterface, D.word);
+        }
 
         [[maybe_unused]] std::conditional_t<kMatched, MatchSession, std::monostate> session;
         Script::Handle* const* words = argv;
         if constexpr (kMatched) {
-            if (session.SetUp(interp, D.options.data(), N) != 0) return 1;
-            if (session.Pass(interp, argc, argv, kFirstOption) != 0) return 1;
+            if (session.SetUp(interp, D.options.data(), N) != 0)
+                return SetFailureCode(interp, Failure::Loader, kInterface, D.word);
+            if (session.Pass(interp, argc, argv, kFirstOption) != 0)
+                return session.SetPassFailureCode(interp, kInterface, D.word);
             words = session.Vector();
         }
 
@@ -90,7 +97,10 @@ struct OptionFrame {
         int end = argc;
         if constexpr (N > 0) end = PositionalScan(argc, words, D.options.data(), N);
         const bool countOk = N > 0 ? (kTail ? end >= kFirstOption : end == kFirstOption) : (kTail || argc == kFirstOption);
-        if (!countOk) return ErrorReportWithHelp(interp, kWrongCountText, object, D.word);
+        if (!countOk) {
+            ErrorReportWithHelp(interp, kWrongCountText, object, D.word);
+            return SetFailureCode(interp, Failure::Count, kInterface, D.word);
+        }
 
         if (FetchPositionals(values.positionals, interp, words, end) != 0) return 1;
         if constexpr (N > 0) {
@@ -103,12 +113,20 @@ struct OptionFrame {
                 [&](auto&... args) { return (object->*D.op)(args..., values.out, values.message); },
                 std::tuple_cat(std::apply([](auto&... p) { return std::tie(p...); }, values.positionals),
                                std::apply([](auto&... o) { return std::tie(o...); }, values.options)));
-            if (result != 1) return ErrorReport(interp, values.message);
+            if (result != 1) return ReportOperationFailure(interp, values.message, kInterface, D.word);
             return StoreResultProperty(values.out, values.message, interp);
         } catch (...) {
-            return ErrorReport(interp, MethodText(kExceptionText, W::kClassName, D.word));
+            ErrorReport(interp, MethodText(kExceptionText, W::kClassName, D.word));
+            return SetFailureCode(interp, Failure::Exception, kInterface, D.word);
         }
     }
+
+    // The kind of a fetch that failed: a property fails only when its component cannot be made; any
+    // other type when the word is not a value of it.
+    template <class T>
+    static constexpr Failure kFetchFailure =
+        std::is_same_v<T, UtilI::MITclProperty> || std::is_same_v<T, UtilI::TclPropertyList> ? Failure::Loader
+                                                                                               : Failure::Value;
 
     // Positionals from word 2 on; a tail list takes the word at the last positional place and every
     // word up to `end`.
@@ -117,13 +135,20 @@ struct OptionFrame {
         if constexpr (kTail) std::get<R - 1>(positionals).reserve(static_cast<size_t>(end - kFirstOption + 1));
         return [&]<size_t... K>(std::index_sequence<K...>) {
             int failed = 0;
-            ((failed = failed ? failed : FetchValue(std::get<K>(positionals), interp, words[K + 2], Script::IN)), ...);
+            ((failed = failed ? failed : FetchPositional<K>(positionals, interp, words[K + 2])), ...);
             if constexpr (kTail) {
                 for (int i = kFirstOption; failed == 0 && i < end; ++i)
-                    failed = FetchValue(std::get<R - 1>(positionals), interp, words[i], Script::IN);
+                    failed = FetchPositional<R - 1>(positionals, interp, words[i]);
             }
             return failed;
         }(std::make_index_sequence<R>{});
+    }
+
+    template <size_t K>
+    static int FetchPositional(Positionals& positionals, Tcl_Interp* interp, Script::Handle* word) {
+        using T = std::tuple_element_t<K, Positionals>;
+        if (FetchValue(std::get<K>(positionals), interp, word, Script::IN) == 0) return 0;
+        return SetFailureCode(interp, kFetchFailure<T>, kInterface, D.word);
     }
 
     static int LoadDefaults(Values& values, Tcl_Interp* interp) {
@@ -141,12 +166,13 @@ struct OptionFrame {
         if (line.line == nullptr) MakeDefaultLine(line, W::kClassName, D.word, D.options[K], kMatched);
         const Option& option = D.options[K];
         Script::TclObjRef set;
-        if (SetDefault(interp, line, set) != TCL_OK) return ReportDefaultFailure(interp, option.name, TypeWord<T>());
+        if (SetDefault(interp, line, set) != TCL_OK)
+            return ReportDefaultFailure(interp, option.name, TypeWord<T>(), kInterface, D.word);
         // The value itself when nothing watches the variable, else the variable read back.
         Script::TclObjHandleBase word(set ? set.get() : line.variable);
         T& value = std::get<K>(values.options);
         if (FetchValue(value, interp, &word, set ? Script::IN : Script::INOUT) != 0)
-            return ReportDefaultFailure(interp, option.name, TypeWord<T>());
+            return ReportDefaultFailure(interp, option.name, TypeWord<T>(), kInterface, D.word);
         if constexpr (std::is_same_v<T, UtilI::TclPropertyList>) values.listHoldsDefault[K] = true;
         return 0;
     }
@@ -155,9 +181,9 @@ struct OptionFrame {
                     I* object) {
         for (int i = start; i < argc;) {
             const char* word = WordText(words[i]);
-            if (word[0] != '-') return ReportNotASwitch(interp, word, object, D.signature);
+            if (word[0] != '-') return ReportNotASwitch(interp, word, object, D.signature, kInterface, D.word);
             const int k = FindOption(word + 1, D.options.data(), N);
-            if (k < 0) return ReportUnrecognized(interp, word + 1, object, D.signature);
+            if (k < 0) return ReportUnrecognized(interp, word + 1, object, D.signature, kInterface, D.word);
             const int failed = [&]<size_t... K>(std::index_sequence<K...>) {
                 int rc = 0;
                 ((static_cast<size_t>(k) == K ? (rc = WalkOption<K>(values, interp, words, argc, i), 0) : 0), ...);
@@ -182,10 +208,10 @@ struct OptionFrame {
                 return 0;
             }
         } else {
-            if (last) return ReportExpectsValue(interp, D.options[K].name, TypeWord<T>());
+            if (last) return ReportExpectsValue(interp, D.options[K].name, TypeWord<T>(), kInterface, D.word);
             if constexpr (std::is_same_v<T, UtilI::TclPropertyList>) {
                 UtilI::MITclProperty element;
-                if (FetchValue(element, interp, words[i + 1], Script::IN) != 0) return 1;
+                if (FetchValue(element, interp, words[i + 1], Script::IN) != 0) return OptionValueFailure<T>(interp, K);
                 if (values.listHoldsDefault[K]) {
                     ReleaseValue(value);
                     values.listHoldsDefault[K] = false;
@@ -195,9 +221,15 @@ struct OptionFrame {
                 return 0;
             }
         }
-        if (FetchValue(value, interp, words[i + 1], Script::IN) != 0) return 1;
+        if (FetchValue(value, interp, words[i + 1], Script::IN) != 0) return OptionValueFailure<T>(interp, K);
         i += 2;
         return 0;
+    }
+
+    template <class T>
+    static int OptionValueFailure(Tcl_Interp* interp, size_t k) {
+        return SetFailureCode(interp, kFetchFailure<T>, kInterface, D.word,
+                              Port_String("-", D.options[k].name).c_str());
     }
 };
 

@@ -87,18 +87,16 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
         }
         const Port_String typed(text + 1);  // the name without its one leading dash
         CommonI::RefCountPtr<IOptionNameIterator> candidates;
-        if (m_valid->GetIterator(candidates) != 1 || !candidates)
-            return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+        if (m_valid->GetIterator(candidates) != 1 || !candidates) return MatcherFailure(interp, typed);
         CommonI::RESULT matched;
         {
             CommonI::RefCountPtr<IOptionNameSource> source(candidates);
             matched = m_matcher->Match(typed, source, m_matches);
         }
-        if (matched != 1 || !m_matches)
-            return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+        if (matched != 1 || !m_matches) return MatcherFailure(interp, typed);
         const int32_t found = m_matches->Size();
-        if (found == 0) return NoMatch(interp, typed);
-        if (found > 1) return Ambiguous(interp, typed);
+        if (found == 0) return NoMatch(interp, typed, text);
+        if (found > 1) return Ambiguous(interp, typed, text);
         CommonI::RefCountPtr<IOptionNameIterator> match;
         m_matches->GetIterator(match);
         match->First();
@@ -109,7 +107,9 @@ int MatchSession::Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv
     return 0;
 }
 
-int MatchSession::NoMatch(Tcl_Interp* interp, const Port_String& typed) {
+int MatchSession::NoMatch(Tcl_Interp* interp, const Port_String& typed, const char* word) {
+    m_refusal = kOptionUnknown;
+    m_refused = word;
     Port_String text = Translate("Optional argument '%s' does not match with any of valid optional arguments.\n"
                                  "Please specify one of the following options\n",
                                  typed.c_str());
@@ -117,11 +117,24 @@ int MatchSession::NoMatch(Tcl_Interp* interp, const Port_String& typed) {
     return ReportWithoutReset(interp, text);
 }
 
+int MatchSession::MatcherFailure(Tcl_Interp* interp, const Port_String& typed) {
+    m_refusal = nullptr;
+    return ReportWithoutReset(interp, Translate("Error matching optional argument '%s'\n", typed.c_str()));
+}
+
 // The candidates are put together for the message's arguments, which its format does not show.
-int MatchSession::Ambiguous(Tcl_Interp* interp, const Port_String& typed) {
+int MatchSession::Ambiguous(Tcl_Interp* interp, const Port_String& typed, const char* word) {
+    m_refusal = kOptionAmbiguous;
+    m_refused = word;
     Port_String candidates;
     AppendNames(candidates, m_matches.get(), " \"-", "\" ");
     return ReportWithoutReset(interp, Translate("Ambiguous optional argument 'errors\n", typed.c_str(), candidates.c_str()));
+}
+
+// The matcher or its lists failing is a component's fault, not a fault of the word typed.
+int MatchSession::SetPassFailureCode(Tcl_Interp* interp, const char* interfaceName, const char* word) const {
+    if (m_refusal == nullptr) return SetFailureCode(interp, Failure::Loader, interfaceName, word);
+    return SetFailureCode(interp, Failure::Option, interfaceName, word, m_refusal, m_refused);
 }
 
 int FindOption(const char* name, const Option* options, size_t count) {
@@ -138,26 +151,36 @@ int PositionalScan(int argc, Script::Handle* const* words, const Option* options
     return argc;
 }
 
-int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord) {
-    return ErrorReport(interp, Port_String("\nFailure(s) took place while retrieving the default value for ",
-                                           "\noptional argument '", name, "' of type '", typeWord, "'"));
+int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                         const char* command) {
+    ErrorReport(interp, Port_String("\nFailure(s) took place while retrieving the default value for ",
+                                    "\noptional argument '", name, "' of type '", typeWord, "'"));
+    return SetFailureCode(interp, Failure::Default, interfaceName, command, Port_String("-", name).c_str());
 }
 
-int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord) {
-    return ErrorReport(interp,
-                       Port_String("\nOptional argument '", name, "' of type '", typeWord, "' expects a value"));
+int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                       const char* command) {
+    ErrorReport(interp, Port_String("\nOptional argument '", name, "' of type '", typeWord, "' expects a value"));
+    return SetFailureCode(interp, Failure::Option, interfaceName, command, kOptionNoValue,
+                          Port_String("-", name).c_str());
 }
 
-int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature) {
-    return ErrorReportWithHelp(interp,
-                               Port_String("The current argument \"", word,
-                                           "\" is not an optional argument switch as expected."),
-                               object, OperationName(signature).c_str());
+int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature,
+                     const char* interfaceName, const char* command) {
+    // A copy of the word: the help may run code of its own before the code is set.
+    const Port_String typed(word);
+    ErrorReportWithHelp(
+        interp, Port_String("The current argument \"", word, "\" is not an optional argument switch as expected."),
+        object, OperationName(signature).c_str());
+    return SetFailureCode(interp, Failure::Option, interfaceName, command, kOptionNotSwitch, typed.c_str());
 }
 
-int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature) {
-    return ErrorReportWithHelp(interp, Port_String("Unrecognized optional argument \"-", name, "\""), object,
-                               OperationName(signature).c_str());
+int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature,
+                       const char* interfaceName, const char* command) {
+    const Port_String typed("-", name);
+    ErrorReportWithHelp(interp, Port_String("Unrecognized optional argument \"", typed.c_str(), "\""), object,
+                        OperationName(signature).c_str());
+    return SetFailureCode(interp, Failure::Option, interfaceName, command, kOptionUnknown, typed.c_str());
 }
 
 }  // namespace TcltaskI

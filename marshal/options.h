@@ -45,14 +45,25 @@ public:
     // as they are, every other word becomes the full name of the one option it abbreviates.
     // 0, or 1 after the failure has been reported.
     int Pass(Tcl_Interp* interp, int argc, Script::Handle* const* argv, int firstOption);
+    // After Pass failed: sets the error code of its failure for the command `word` of
+    // `interfaceName`, and gives 1.
+    int SetPassFailureCode(Tcl_Interp* interp, const char* interfaceName, const char* word) const;
     Script::Handle* const* Vector() const { return m_slots; }
 
 private:
     static constexpr int kInlineWords = 16;
 
-    int NoMatch(Tcl_Interp* interp, const Port_String& typed);
-    int Ambiguous(Tcl_Interp* interp, const Port_String& typed);
+    // The failures of the matching pass; `word` is the option word as typed.
+    int NoMatch(Tcl_Interp* interp, const Port_String& typed, const char* word);
+    int Ambiguous(Tcl_Interp* interp, const Port_String& typed, const char* word);
+    int MatcherFailure(Tcl_Interp* interp, const Port_String& typed);
     Script::Handle* MakeWord(const Port_String& name);
+
+    // What a failed Pass refused: the reason of an OPTION code (null when the matcher failed) and
+    // the option word as typed. Set by the failure paths alone and read only after one of them, so
+    // that a call that succeeds does not pay for them.
+    const char* m_refusal;
+    const char* m_refused;
 
     CommonI::RefCountPtr<ICmdArgMatcher> m_matcher;
     CommonI::RefCountPtr<IOptionNameList> m_matches;
@@ -83,9 +94,15 @@ inline const char* WordText(Script::Handle* handle) {
     return text != nullptr ? text : "";
 }
 
-int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord);
-int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord);
-int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature);
-int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature);
+// The option failures of the command `command` of `interfaceName`: the text, and the error code that
+// names the command and the option.
+int ReportDefaultFailure(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                         const char* command);
+int ReportExpectsValue(Tcl_Interp* interp, const char* name, const char* typeWord, const char* interfaceName,
+                       const char* command);
+int ReportNotASwitch(Tcl_Interp* interp, const char* word, CitI::IInterface* object, const char* signature,
+                     const char* interfaceName, const char* command);
+int ReportUnrecognized(Tcl_Interp* interp, const char* name, CitI::IInterface* object, const char* signature,
+                       const char* interfaceName, const char* command);
 
 }  // namespace TcltaskI

@@ -70,23 +70,32 @@ struct PlainFrame {
     static constexpr size_t R = Traits::arity;
     static_assert(static_cast<size_t>(D.required) == R, "the row's required count must match the operation");
 
+    static constexpr const char* kInterface = I::NAME;
+
     static int Run(W& self, int argc, Script::Handle* const* argv, Tcl_Interp* interp) {
         I* object = nullptr;
-        if (self.Object(&object) != 0) return ErrorReport(interp, MethodText(kNoObjectText, W::kClassName, D.word));
+        if (self.Object(&object) != 0) {
+            ErrorReport(interp, MethodText(kNoObjectText, W::kClassName, D.word));
+            return SetFailureCode(interp, Failure::Object, kInterface, D.word);
+        }
         return [&]<size_t... K>(std::index_sequence<K...>) {
             // Out pointers start null, so that an operation that forgets one stores 0, not garbage.
             std::tuple<plain::Local<std::tuple_element_t<K, Params>>...> locals{};
-            if (argc != static_cast<int>(R) + 2) return ErrorReport(interp, kWrongCountText);
+            if (argc != static_cast<int>(R) + 2) {
+                ErrorReport(interp, kWrongCountText);
+                return SetFailureCode(interp, Failure::Count, kInterface, D.word);
+            }
             int failed = 0;
             ((failed = failed ? failed : FetchIn<K>(std::get<K>(locals), interp, argv[K + 2])), ...);
-            if (failed != 0) return 1;
+            if (failed != 0) return SetFailureCode(interp, Failure::Value, kInterface, D.word);
             try {
                 const auto result = (object->*D.op)(std::get<K>(locals)...);
                 ((failed = failed ? failed : StoreOutArg<K>(std::get<K>(locals), interp, argv[K + 2])), ...);
-                if (failed != 0) return 1;
-                return plain::StoreResult(result, interp) != 0 ? 1 : 0;
+                if (failed == 0 && plain::StoreResult(result, interp) == 0) return 0;
+                return SetFailureCode(interp, Failure::Store, kInterface, D.word);
             } catch (...) {
-                return ErrorReport(interp, MethodText(kExceptionText, W::kClassName, D.word));
+                ErrorReport(interp, MethodText(kExceptionText, W::kClassName, D.word));
+                return SetFailureCode(interp, Failure::Exception, kInterface, D.word);
             }
         }(std::make_index_sequence<R>{});
     }

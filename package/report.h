@@ -13,6 +13,39 @@ int ErrorReport(Tcl_Interp* interp, const Port_String& text);
 // The same without resetting the result first. Gives 1.
 int ReportWithoutReset(Tcl_Interp* interp, const Port_String& text);
 
+// The kinds of failure a script tells apart by the error code, without reading the text. The code is
+// the list {KELMAR <kind> <interface> <command word> ...}: the interface as its NAME (ICollection),
+// since the package knows the class it wraps, not the word a tool publishes it under.
+enum class Failure {
+    Count,      // COUNT: the wrong number of words
+    Word,       // WORD: no command of that word; the third word is the word typed
+    Option,     // OPTION <why> <option>: an option word the command cannot take
+    Default,    // DEFAULT <option>: an option's default could not be set or read
+    Value,      // VALUE ?<option>?: a word could not be read as the type the command takes
+    Object,     // OBJECT: the wrapper holds no object
+    Loader,     // LOADER: a component library or component the call needs failed
+    Operation,  // OPERATION: the operation gave failure, unless it set an error code of its own
+    Exception,  // EXCEPTION: the operation threw
+    Store,      // STORE: the answer or an out variable could not be handed to Tcl
+};
+
+// Why an option word is refused: the fifth word of an OPTION code.
+inline constexpr const char* kOptionUnknown = "UNKNOWN";
+inline constexpr const char* kOptionAmbiguous = "AMBIGUOUS";
+inline constexpr const char* kOptionNoValue = "NOVALUE";
+inline constexpr const char* kOptionNotSwitch = "NOTSWITCH";
+
+// Sets the error code of a failure already reported (a report resets the code) and gives 1. Called
+// on failure paths only: a call that succeeds builds no code.
+int SetFailureCode(Tcl_Interp* interp, Failure kind, const char* interfaceName, const char* word,
+                   const char* more = nullptr, const char* further = nullptr);
+
+// The report of an operation that gave failure: its message as the error, and the error code the
+// operation set on the interpreter if it set one (a tool's kind of refusal, or the code of a script
+// the operation ran), else {KELMAR OPERATION <interface> <word>}. Gives 1.
+int ReportOperationFailure(Tcl_Interp* interp, const Port_String& message, const char* interfaceName,
+                           const char* word);
+
 // Appends "\n" and the usage text of `word` when the object offers ICommandHelp.
 void AppendHelp(Port_String& text, CitI::IInterface* object, const char* word);
 

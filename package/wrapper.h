@@ -39,8 +39,11 @@ enum class CountMessage { Signature, Help };
 enum class WordCompare { Bytes, UtStr };
 
 // Texts of the dispatch that depend on nothing but the call; shared by the eleven classes.
-int ReportUnknownWord(Tcl_Interp* interp, const char* word, const char* className, const Port_String& listing);
-int ReportTooFew(Tcl_Interp* interp, CountMessage form, const char* signature, Script::Handle* const* argv);
+// The error codes name the interface by its NAME and the command word.
+int ReportUnknownWord(Tcl_Interp* interp, const char* word, const char* className, const char* interfaceName,
+                      const Port_String& listing, const char* typed);
+int ReportTooFew(Tcl_Interp* interp, CountMessage form, const char* signature, Script::Handle* const* argv,
+                 const char* interfaceName, const char* word);
 
 template <class W, class I, CountMessage Form, WordCompare Compare>
 class TclWrap : public Script::PtrHandle<I> {
@@ -88,35 +91,41 @@ public:
 
     int Execute(int argc, Script::Handle* const* argv, Tcl_Interp* interp) override {
         const char* word = "no command";
+        const char* typed = nullptr;
         if (argc >= 2) {
-            const char* typed = argv[1]->GetString();
+            typed = argv[1]->GetString();
             word = typed != nullptr ? typed : "NULL";
             if (typed != nullptr) {
                 for (const Entry& row : W::table) {
                     if (!Matches(typed, row.name)) continue;
                     if (row.required + 2 > argc)
-                        return ReportTooFew(interp, Form, row.signature, argv);
+                        return ReportTooFew(interp, Form, row.signature, argv, I::NAME, row.name);
                     return (static_cast<W*>(this)->*row.handler)(argc, argv, interp);
                 }
             }
         }
         Port_String listing;
         for (const Entry& row : W::table) listing += Port_String("    ", row.name, "\n");
-        return ReportUnknownWord(interp, word, W::kClassName, listing);
+        // The code holds the word as typed, and an empty word when there was none.
+        return ReportUnknownWord(interp, word, W::kClassName, I::NAME, listing, typed != nullptr ? typed : "");
     }
 
     // The GetInterface command: the object's interface of the given identifier, wrapped anew.
     int GetInterface(int, Script::Handle* const* argv, Tcl_Interp* interp) {
         const Port::XUID id(argv[2]->GetString());
         I* object = nullptr;
-        if (Object(&object) != 0)
-            return ReportWithoutReset(interp, Port_String("Failed to get TcltaskI::", I::NAME, " in ", W::kClassName,
-                                                          "::GetInterface."));
+        if (Object(&object) != 0) {
+            ReportWithoutReset(interp, Port_String("Failed to get TcltaskI::", I::NAME, " in ", W::kClassName,
+                                                   "::GetInterface."));
+            return SetFailureCode(interp, Failure::Object, I::NAME, "GetInterface");
+        }
         try {
             CitI::IInterface* face = object->GetInterface(id);
-            return Script::TclWrapSupport::TclWrapResolver(id, face, interp);
+            if (Script::TclWrapSupport::TclWrapResolver(id, face, interp) == TCL_OK) return TCL_OK;
+            return SetFailureCode(interp, Failure::Store, I::NAME, "GetInterface");
         } catch (...) {
-            return ReportWithoutReset(interp, Port_String(kExceptionText, W::kClassName, "::GetInterface."));
+            ReportWithoutReset(interp, Port_String(kExceptionText, W::kClassName, "::GetInterface."));
+            return SetFailureCode(interp, Failure::Exception, I::NAME, "GetInterface");
         }
     }
 

@@ -74,20 +74,20 @@ public:
         for (const std::string& member : members) {
             if (Tcl_InterpDeleted(interp)) return Fail(message, kStateGone);
             if (Tcl_SetVar2Ex(interp, variable.c_str(), nullptr, NewText(member), TCL_LEAVE_ERR_MSG) == nullptr)
-                return Fail(message, Tcl_GetStringResult(interp));
+                return Refuse(*m_state, message, Refusal::Value, Tcl_GetStringResult(interp));
             const int code = Tcl_EvalObjEx(interp, script.get(), 0);
             if (code == TCL_BREAK) break;
             if (code == TCL_OK || code == TCL_CONTINUE) continue;
+            // The error code of the body's error stays, as Tcl's foreach keeps it.
             if (code == TCL_ERROR) {
                 Tcl_AddErrorInfo(interp, "\n    (\"collection foreach\" body)");
                 return Fail(message, Tcl_GetStringResult(interp));
             }
             // The answer of an operation is a value or a failure: a return, or a code of the script's
             // own, cannot pass through it, and is not to be lost.
-            return Fail(message, (code == TCL_RETURN ? std::string("\"return\"")
-                                                     : "the code " + std::to_string(code)) +
-                                     " cannot leave the body of collection foreach: the walk stopped at '" + member +
-                                     "'");
+            return Refuse(*m_state, message, Refusal::Script, {std::to_string(code)},
+                          (code == TCL_RETURN ? std::string("\"return\"") : "the code " + std::to_string(code)) +
+                              " cannot leave the body of collection foreach: the walk stopped at '" + member + "'");
         }
         Tcl_ResetResult(interp);
         result = nullptr;
@@ -99,15 +99,16 @@ public:
         std::vector<std::string> members;
         if (!Resolve(collection, members, message)) return 0;
         if (position < 0 || static_cast<std::size_t>(position) >= members.size())
-            return Fail(message, "index " + std::to_string(position) + " is out of range: the collection holds " +
-                                     std::to_string(members.size()) + " objects");
+            return Refuse(*m_state, message, Refusal::Value,
+                          "index " + std::to_string(position) + " is out of range: the collection holds " +
+                              std::to_string(members.size()) + " objects");
         return Answer(NewText(members[static_cast<std::size_t>(position)]), result, message);
     }
 
     CommonI::RESULT remove_from(const Str& name, const List& items, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
         auto it = m_state->collections.find(name.c_str());
-        if (it == m_state->collections.end()) return Fail(message, UnknownCollection(name));
+        if (it == m_state->collections.end()) return UnknownCollection(name, message);
         std::vector<std::string> drop;
         if (!ResolveAll(items, drop, message)) return 0;
         const std::set<std::string> gone(drop.begin(), drop.end());
@@ -133,7 +134,7 @@ public:
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
         auto it = m_state->collections.find(name.c_str());
-        if (it == m_state->collections.end()) return Fail(message, UnknownCollection(name));
+        if (it == m_state->collections.end()) return UnknownCollection(name, message);
         return Answer(NewList(it->second), result, message);
     }
 
@@ -145,8 +146,9 @@ public:
     }
 
 private:
-    static std::string UnknownCollection(const Str& name) {
-        return std::string("no collection is named '") + name.c_str() + "'";
+    CommonI::RESULT UnknownCollection(const Str& name, Msg& message) const {
+        return Refuse(*m_state, message, Refusal::Unknown, {"COLLECTION", name.c_str()},
+                      std::string("no collection is named '") + name.c_str() + "'");
     }
 
     std::vector<std::string> Members(const Str& name) const {
@@ -157,10 +159,11 @@ private:
     // A collection may not take the name of a design object, which would hide the object.
     bool CheckName(const Str& name, Msg& message) const {
         const Design* design = m_state->CurrentDesign();
-        if (design == nullptr) return Fail(message, kNoProject);
-        if (name.IsEmpty()) return Fail(message, "a collection needs a name");
+        if (design == nullptr) return Refuse(*m_state, message, Refusal::NoProject, kNoProject);
+        if (name.IsEmpty()) return Refuse(*m_state, message, Refusal::Value, "a collection needs a name");
         if (design->Find(name.c_str()))
-            return Fail(message, std::string("'") + name.c_str() + "' names a design object and cannot name a collection");
+            return Refuse(*m_state, message, Refusal::Value,
+                          std::string("'") + name.c_str() + "' names a design object and cannot name a collection");
         return true;
     }
 

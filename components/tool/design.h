@@ -10,6 +10,7 @@
 #include <tcl.h>
 
 #include <cstdint>
+#include <initializer_list>
 #include <map>
 #include <memory>
 #include <optional>
@@ -303,7 +304,8 @@ using StatePtr = std::shared_ptr<ToolState>;
 StatePtr StateOf(Tcl_Interp* interp);
 
 // Resolves a collection value: the name of a collection, or a list of object names of the current
-// design. False with `error` set when a name is unknown or no project is open.
+// design. False with `error` set, and the error code of the refusal (SetRefusal), when a name is
+// unknown, the value is no list or no project is open.
 bool ResolveObjects(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& names, std::string& error);
 // The same names without a copy: the collection's own list when the value names one, else `own`
 // filled; null after setting `error`. The list stays valid until the collections change.
@@ -317,6 +319,26 @@ inline constexpr const char* kStateGone = "the tool state of this interpreter is
 
 // False, with kStateGone in `message`, once the interpreter of `state` is gone.
 bool Alive(const ToolState& state, Port_String& message);
+
+// The kinds of refusal a script tells apart without reading the text: the error code
+// {KELMAR TOOL <kind> ...} that an operation sets on the state's interpreter before it gives failure,
+// and that the package hands on with the failure text.
+enum class Refusal {
+    NoProject,  // NOPROJECT: no project is open
+    Unknown,    // UNKNOWN <what> <name>: a name that names nothing of its kind
+    File,       // FILE <file>: a file cannot be read, understood or written
+    State,      // STATE: the command does not fit what is open or done now
+    Limit,      // LIMIT: the answer would pass one of the tool's limits
+    Value,      // VALUE: an argument the command does not take
+    Script,     // SCRIPT <code>: a script's code that cannot leave the body the tool runs
+};
+
+// Sets the error code {KELMAR TOOL <kind> <more>...} on the state's interpreter, while it has one.
+void SetRefusal(const ToolState& state, Refusal kind, std::initializer_list<std::string_view> more = {});
+// Gives 0 with `text` as the failure text, after setting the error code of `kind`.
+CommonI::RESULT Refuse(const ToolState& state, Port_String& message, Refusal kind, const std::string& text);
+CommonI::RESULT Refuse(const ToolState& state, Port_String& message, Refusal kind,
+                       std::initializer_list<std::string_view> more, const std::string& text);
 
 // The analyses and the floorplan of the state, made in timing.cpp and floorplan.cpp; each answers
 // through the counted interface with no reference taken yet.

@@ -100,19 +100,21 @@ public:
         return Opening(result, message, [&](ToolState& state, FloorplanData& fresh) -> RESULT {
             const std::string file = s1.c_str(), formWord = s2.c_str(), mode = s3.c_str();
             const auto form = FormFromWord(formWord);
-            if (!form) return Fail(message, "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
+            if (!form)
+                return Refuse(state, message, Refusal::Value,
+                              "unknown constraint form '" + formWord + "': use ucf, csv, vhdl or vlog");
             if (mode != "replace" && mode != "merge")
-                return Fail(message, "unknown mode '" + mode + "': use replace or merge");
+                return Refuse(state, message, Refusal::Value, "unknown mode '" + mode + "': use replace or merge");
             FloorplanConstraints read;
             std::string error;
-            if (!Load(*form, file, read, error)) return Fail(message, error);
+            if (!Load(*form, file, read, error)) return Refuse(state, message, Refusal::File, {file}, error);
             if (mode == "replace") {
                 fresh.constraints.blocks.clear();
                 fresh.constraints.prohibited.clear();
             }
             MergeConstraints(fresh.constraints, read);
             error = CheckConstraints(*state.CurrentDesign(), fresh.device, fresh.constraints);
-            if (!error.empty()) return Fail(message, "'" + file + "': " + error);
+            if (!error.empty()) return Refuse(state, message, Refusal::File, {file}, "'" + file + "': " + error);
             fresh.modified = true;
             return 1;
         });
@@ -120,32 +122,37 @@ public:
 
     RESULT open_empty(const Str& s1, const Str& s2, const Str& s3, const Str& s4, const Str& s5, const Str& s6,
                       const Str& s7, const Str& s8, const Str& s9, Out& result, Msg& message) override {
-        return Opening(result, message, [&](ToolState&, FloorplanData& fresh) -> RESULT {
+        return Opening(result, message, [&](ToolState& state, FloorplanData& fresh) -> RESULT {
             const std::string name = s1.c_str(), device = s2.c_str(), layout = s6.c_str();
             int columns = 0, rows = 0, banks = 0, sso = 0, capacity = 0, clocks = 0;
-            if (name.empty()) return Fail(message, "the floorplan needs a name");
-            if (device.empty()) return Fail(message, "the device needs a name");
+            if (name.empty()) return Refuse(state, message, Refusal::Value, "the floorplan needs a name");
+            if (device.empty()) return Refuse(state, message, Refusal::Value, "the device needs a name");
             if (!WholeNumber(s3.c_str(), 1, kMaxSide, columns))
-                return Fail(message,
-                            "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the columns must be a whole number from 1, not '" + std::string(s3.c_str()) + "'");
             if (!WholeNumber(s4.c_str(), 1, kMaxSide, rows))
-                return Fail(message, "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the rows must be a whole number from 1, not '" + std::string(s4.c_str()) + "'");
             if (layout != "columns" && layout != "rows")
-                return Fail(message, "unknown bank layout '" + layout + "': use columns or rows");
+                return Refuse(state, message, Refusal::Value,
+                              "unknown bank layout '" + layout + "': use columns or rows");
             const int stripes = layout == "columns" ? columns : rows;
             const int most = std::min(stripes, kMaxBanks);
             if (!WholeNumber(s5.c_str(), 1, most, banks))
-                return Fail(message, "the banks must be a whole number from 1 to " + std::to_string(most) + ", not '" +
-                                         std::string(s5.c_str()) + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the banks must be a whole number from 1 to " + std::to_string(most) + ", not '" +
+                                  std::string(s5.c_str()) + "'");
             if (!WholeNumber(s7.c_str(), 0, kMaxCount, sso))
-                return Fail(message, "the sso limit must be a whole number of at least 0, not '" +
-                                         std::string(s7.c_str()) + "'");
+                return Refuse(
+                    state, message, Refusal::Value,
+                    "the sso limit must be a whole number of at least 0, not '" + std::string(s7.c_str()) + "'");
             if (!WholeNumber(s8.c_str(), 1, kMaxCount, capacity))
-                return Fail(message,
-                            "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the site capacity must be a whole number from 1, not '" + std::string(s8.c_str()) + "'");
             if (!WholeNumber(s9.c_str(), 0, kMaxCount, clocks))
-                return Fail(message, "the clock limit must be a whole number of at least 0, not '" +
-                                         std::string(s9.c_str()) + "'");
+                return Refuse(
+                    state, message, Refusal::Value,
+                    "the clock limit must be a whole number of at least 0, not '" + std::string(s9.c_str()) + "'");
             Device d;
             d.name = device;
             d.columns = columns;
@@ -177,7 +184,7 @@ public:
     RESULT close(bool nosave, Out& result, Msg& message) override {
         return m_state.On(message, [&](ToolState& state) -> RESULT {
             FloorplanData& plan = Plan(state);
-            if (!plan.open) return Fail(message, kNotOpen);
+            if (!plan.open) return Refuse(state, message, Refusal::State, kNotOpen);
             Saved saved;
             if (!nosave && !Commit(state, saved, message)) return 0;
             if (!Answer(DictBuilder().Add("saved", !nosave).Add("file", saved.file).Add("changed", saved.changed).Take(),
@@ -204,11 +211,13 @@ public:
             for (const auto& [form, file] : Files(ucf, csv, vhdl, vlog)) {
                 FloorplanConstraints one;
                 std::string error;
-                if (!Load(form, file, one, error)) return Fail(message, error);
+                if (!Load(form, file, one, error)) return Refuse(state, message, Refusal::File, {file}, error);
                 MergeConstraints(read, one);
                 any = true;
             }
-            if (!any) return Fail(message, "nothing to import: give -ucf, -csv, -vhdl or -vlog with a file");
+            if (!any)
+                return Refuse(state, message, Refusal::Value,
+                              "nothing to import: give -ucf, -csv, -vhdl or -vlog with a file");
             // The files' blocks and prohibited sites take the place of the floorplan's; ports they do not
             // name stay where they are.
             FloorplanConstraints changed = plan.constraints;
@@ -216,7 +225,7 @@ public:
             changed.prohibited = read.prohibited;
             for (const auto& [port, site] : read.ports) changed.ports[port] = site;
             if (std::string error = CheckConstraints(*state.CurrentDesign(), plan.device, changed); !error.empty())
-                return Fail(message, "the imported constraints do not fit: " + error);
+                return Refuse(state, message, Refusal::Value, "the imported constraints do not fit: " + error);
             Tcl_Obj* answer = DictBuilder()
                                   .Add("blocks", read.blocks.size())
                                   .Add("prohibited", read.prohibited.size())
@@ -235,11 +244,14 @@ public:
             // Every text is made and checked before any file is written; each file is then
             // replaced whole or not at all.
             const auto files = Files(ucf, csv, vhdl, vlog);
-            if (files.empty()) return Fail(message, "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
+            if (files.empty())
+                return Refuse(state, message, Refusal::Value,
+                              "nothing to export: give -ucf, -csv, -vhdl or -vlog with a file");
             std::vector<std::string> texts(files.size()), written;
             std::string why;
             auto failed = [&](ConstraintForm form, const std::string& file) {
-                return Fail(message, std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
+                return Refuse(state, message, Refusal::File, {file},
+                              std::string("cannot write the ") + FormWord(form) + " file '" + file + "': " + why);
             };
             for (std::size_t i = 0; i < files.size(); ++i)
                 if (!FormatConstraints(files[i].first, plan.constraints, state.CurrentDesign()->name, texts[i], why))
@@ -256,12 +268,13 @@ public:
         return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             const std::string name = block.c_str();
             if (name.empty() || name.find_first_of(" \t\n") != std::string::npos)
-                return Fail(message, "a block name must be one word, not '" + name + "'");
+                return Refuse(state, message, Refusal::Value, "a block name must be one word, not '" + name + "'");
             std::vector<std::string> names;
             std::string error;
             TclValue value = ValueOf(cells);
             if (!value || !ResolveObjects(state, value.get(), names, error)) return Fail(message, error);
-            if (names.empty()) return Fail(message, "block " + Quote(name) + " needs at least one cell");
+            if (names.empty())
+                return Refuse(state, message, Refusal::Value, "block " + Quote(name) + " needs at least one cell");
             const Design& design = *state.CurrentDesign();
             FloorplanConstraints changed = plan.constraints;
             auto it = std::find_if(changed.blocks.begin(), changed.blocks.end(),
@@ -272,11 +285,12 @@ public:
                 it->name = name;
             }
             for (const std::string& cell : names) {
-                if (!design.FindCell(cell)) return Fail(message, Quote(cell) + " is no cell");
+                if (!design.FindCell(cell)) return Refuse(state, message, Refusal::Value, Quote(cell) + " is no cell");
                 for (const Block& other : changed.blocks)
                     if (other.name != name &&
                         std::find(other.cells.begin(), other.cells.end(), cell) != other.cells.end())
-                        return Fail(message, "cell " + Quote(cell) + " is in block " + Quote(other.name) + " already");
+                        return Refuse(state, message, Refusal::Value,
+                                      "cell " + Quote(cell) + " is in block " + Quote(other.name) + " already");
                 if (std::find(it->cells.begin(), it->cells.end(), cell) == it->cells.end()) it->cells.push_back(cell);
             }
             if (!Answer(NewList(it->cells), result, message)) return 0;
@@ -286,9 +300,9 @@ public:
     }
 
     RESULT ungroup(const Prop& block, Out& result, Msg& message) override {
-        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             std::vector<std::string> names;
-            if (!BlockNames(plan, block, names, message)) return 0;
+            if (!BlockNames(state, plan, block, names, message)) return 0;
             FloorplanConstraints changed = plan.constraints;
             std::erase_if(changed.blocks, [&names](const Block& b) {
                 return std::find(names.begin(), names.end(), b.name) != names.end();
@@ -310,7 +324,7 @@ public:
             const std::string key = name.c_str();
             if (key == "open") return Answer(NewBool(Plan(state).open), result, message);
             if (std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) == kFloorplanProperties.end())
-                return Unknown(key, message);
+                return Unknown(state, key, message);
             FloorplanData* plan = Ready(state, message);
             if (!plan) return 0;
             return Answer(FloorplanProperty(state, *plan, key), result, message);
@@ -323,23 +337,25 @@ public:
             if (std::find(kWritable.begin(), kWritable.end(), key) == kWritable.end()) {
                 if (key == "open" || std::find(kFloorplanProperties.begin(), kFloorplanProperties.end(), key) !=
                                          kFloorplanProperties.end())
-                    return Fail(message, "the floorplan setting '" + key + "' is read-only");
-                return Unknown(key, message);
+                    return Refuse(state, message, Refusal::Value, "the floorplan setting '" + key + "' is read-only");
+                return Unknown(state, key, message);
             }
             FloorplanData* plan = Ready(state, message);
             if (!plan) return 0;
             FloorplanData changed = *plan;
             int number = 0;
             if (key == "name") {
-                if (text.empty()) return Fail(message, "the floorplan needs a name");
+                if (text.empty()) return Refuse(state, message, Refusal::Value, "the floorplan needs a name");
                 changed.name = text;
             } else if (key == "site_capacity") {
                 if (!WholeNumber(text, 1, kMaxCount, number))
-                    return Fail(message, "the site capacity must be a whole number from 1, not '" + text + "'");
+                    return Refuse(state, message, Refusal::Value,
+                                  "the site capacity must be a whole number from 1, not '" + text + "'");
                 changed.device.siteCapacity = number;
             } else if (key == "clock_limit") {
                 if (!WholeNumber(text, 0, kMaxCount, number))
-                    return Fail(message, "the clock limit must be a whole number of at least 0, not '" + text + "'");
+                    return Refuse(state, message, Refusal::Value,
+                                  "the clock limit must be a whole number of at least 0, not '" + text + "'");
                 changed.clockLimit = number;
             } else if (WholeNumber(text, 0, kMaxCount, number)) {
                 for (Bank& b : changed.device.banks) b.ssoLimit = number;
@@ -347,16 +363,18 @@ public:
                 // A dict of bank and limit sets the named banks only.
                 const auto words = Words(text);
                 if (words.empty() || words.size() % 2 != 0)
-                    return Fail(message,
-                                "the sso limit is a whole number for every bank, or a dict of bank and number");
+                    return Refuse(state, message, Refusal::Value,
+                                  "the sso limit is a whole number for every bank, or a dict of bank and number");
                 for (std::size_t i = 0; i < words.size(); i += 2) {
                     auto bank = std::find_if(changed.device.banks.begin(), changed.device.banks.end(),
                                              [&](const Bank& b) { return b.name == words[i]; });
                     if (bank == changed.device.banks.end())
-                        return Fail(message, Quote(words[i]) + " is no bank of the device");
+                        return Refuse(state, message, Refusal::Unknown, {"BANK", words[i]},
+                                      Quote(words[i]) + " is no bank of the device");
                     if (!WholeNumber(words[i + 1], 0, kMaxCount, bank->ssoLimit))
-                        return Fail(message, "the sso limit of " + Quote(words[i]) +
-                                                 " must be a whole number of at least 0, not '" + words[i + 1] + "'");
+                        return Refuse(state, message, Refusal::Value,
+                                      "the sso limit of " + Quote(words[i]) +
+                                          " must be a whole number of at least 0, not '" + words[i + 1] + "'");
                 }
             }
             if (!Answer(FloorplanProperty(state, changed, key), result, message)) return 0;
@@ -375,16 +393,17 @@ public:
     }
 
     RESULT block_get(const Prop& block, const Str& name, Out& result, Msg& message) override {
-        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             std::vector<std::string> names;
-            if (!BlockNames(plan, block, names, message)) return 0;
+            if (!BlockNames(state, plan, block, names, message)) return 0;
             const std::string key = name.c_str();
             const bool builtIn =
                 std::find(kBlockProperties.begin(), kBlockProperties.end(), key) != kBlockProperties.end();
             for (const std::string& n : names)
                 if (!builtIn && !FindBlock(plan, n)->constraints.count(key))
-                    return Fail(message, "block " + Quote(n) + " has no property or constraint " + Quote(key) +
-                                             "; its properties are " + Join(kBlockProperties));
+                    return Refuse(state, message, Refusal::Unknown, {"PROPERTY", key},
+                                  "block " + Quote(n) + " has no property or constraint " + Quote(key) +
+                                      "; its properties are " + Join(kBlockProperties));
             auto valueOf = [&](const std::string& n) {
                 const Block& b = *FindBlock(plan, n);
                 return builtIn ? BlockProperty(plan, b, key) : NewText(b.constraints.at(key));
@@ -398,11 +417,12 @@ public:
 
     RESULT block_set_constraint(const Prop& block, const Str& name, const Str& value, Out& result,
                                 Msg& message) override {
-        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             std::vector<std::string> names;
-            if (!BlockNames(plan, block, names, message)) return 0;
+            if (!BlockNames(state, plan, block, names, message)) return 0;
             const std::string key = name.c_str(), text = value.c_str();
-            if (std::string problem = CheckBlockConstraint(key, text); !problem.empty()) return Fail(message, problem);
+            if (std::string problem = CheckBlockConstraint(key, text); !problem.empty())
+                return Refuse(state, message, Refusal::Value, problem);
             FloorplanConstraints changed = plan.constraints;
             for (Block& b : changed.blocks) {
                 if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
@@ -421,15 +441,17 @@ public:
     }
 
     RESULT block_delete_constraint(const Prop& block, const Str& name, Out& result, Msg& message) override {
-        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             std::vector<std::string> names;
-            if (!BlockNames(plan, block, names, message)) return 0;
+            if (!BlockNames(state, plan, block, names, message)) return 0;
             const std::string key = name.c_str();
             FloorplanConstraints changed = plan.constraints;
             for (Block& b : changed.blocks) {
                 if (std::find(names.begin(), names.end(), b.name) == names.end()) continue;
                 const bool had = key == "region" ? RegionOf(b).has_value() : b.constraints.erase(key) > 0;
-                if (!had) return Fail(message, "block " + Quote(b.name) + " has no constraint " + Quote(key));
+                if (!had)
+                    return Refuse(state, message, Refusal::Unknown, {"CONSTRAINT", key},
+                                  "block " + Quote(b.name) + " has no constraint " + Quote(key));
                 if (key == "region") SetRegion(b, std::nullopt);
             }
             return AnswerBlocks(plan, std::move(changed), names, result, message);
@@ -457,33 +479,38 @@ public:
         return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             const auto from = Words(s1.c_str()), to = Words(s2.c_str()), offset = Words(s3.c_str());
             const std::string mode = s4.c_str();
-            if (mode != "copy" && mode != "swap") return Fail(message, "unknown mode '" + mode + "': use copy or swap");
+            if (mode != "copy" && mode != "swap")
+                return Refuse(state, message, Refusal::Value, "unknown mode '" + mode + "': use copy or swap");
             if (from.empty() || from.size() != to.size())
-                return Fail(message, "the two port lists must be of the same length, and not empty");
+                return Refuse(state, message, Refusal::Value,
+                              "the two port lists must be of the same length, and not empty");
             int dx = 0, dy = 0;
             if (!offset.empty() && (offset.size() != 2 || !WholeNumber(offset[0], -kMaxSide, kMaxSide, dx) ||
                                     !WholeNumber(offset[1], -kMaxSide, kMaxSide, dy)))
-                return Fail(message,
-                            "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the offset is two whole numbers \"dx dy\", not '" + std::string(s3.c_str()) + "'");
             if (mode == "swap" && (dx != 0 || dy != 0))
-                return Fail(message, "swap moves no pin by an offset: give \"0 0\"");
+                return Refuse(state, message, Refusal::Value, "swap moves no pin by an offset: give \"0 0\"");
             const Design& design = *state.CurrentDesign();
             std::set<std::string> seen;
             for (const std::string& p : from) seen.insert(p);
             for (const std::string& p : to)
-                if (!seen.insert(p).second) return Fail(message, "port " + Quote(p) + " is named twice");
+                if (!seen.insert(p).second)
+                    return Refuse(state, message, Refusal::Value, "port " + Quote(p) + " is named twice");
             auto sites = plan.constraints.ports;
             DictBuilder moved;
             for (std::size_t i = 0; i < from.size(); ++i) {
                 for (const std::string* p : {&from[i], &to[i]})
-                    if (!design.FindPort(*p)) return Fail(message, Quote(*p) + " is no port of the design");
+                    if (!design.FindPort(*p))
+                        return Refuse(state, message, Refusal::Unknown, {"PORT", *p},
+                                      Quote(*p) + " is no port of the design");
                 const auto source = plan.constraints.ports.find(from[i]);
                 if (source == plan.constraints.ports.end())
-                    return Fail(message, "port " + Quote(from[i]) + " is not placed");
+                    return Refuse(state, message, Refusal::Value, "port " + Quote(from[i]) + " is not placed");
                 if (mode == "swap") {
                     const auto target = plan.constraints.ports.find(to[i]);
                     if (target == plan.constraints.ports.end())
-                        return Fail(message, "port " + Quote(to[i]) + " is not placed");
+                        return Refuse(state, message, Refusal::Value, "port " + Quote(to[i]) + " is not placed");
                     sites[to[i]] = source->second;
                     sites[from[i]] = target->second;
                     continue;
@@ -491,20 +518,23 @@ public:
                 int x = 0, y = 0;
                 ParseSiteName(source->second, x, y);
                 if (!plan.device.OnDevice(x + dx, y + dy))
-                    return Fail(message, "port " + Quote(to[i]) + " would leave the device: " + source->second +
-                                             " moved by " + std::to_string(dx) + " " + std::to_string(dy));
+                    return Refuse(state, message, Refusal::Value,
+                                  "port " + Quote(to[i]) + " would leave the device: " + source->second + " moved by " +
+                                      std::to_string(dx) + " " + std::to_string(dy));
                 sites[to[i]] = Device::SiteName(x + dx, y + dy);
             }
             std::map<std::string, std::string> holder;  // site -> port
             for (const auto& [port, site] : sites) {
                 auto [it, fresh] = holder.emplace(site, port);
                 if (!fresh)
-                    return Fail(message,
-                                "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
+                    return Refuse(
+                        state, message, Refusal::Value,
+                        "ports " + Quote(it->second) + " and " + Quote(port) + " would share the site " + site);
                 const auto before = plan.constraints.ports.find(port);
                 const bool changed = before == plan.constraints.ports.end() || before->second != site;
                 if (changed && plan.constraints.prohibited.count(site))
-                    return Fail(message, "port " + Quote(port) + " would be placed on the prohibited site " + site);
+                    return Refuse(state, message, Refusal::Value,
+                                  "port " + Quote(port) + " would be placed on the prohibited site " + site);
                 if (changed) moved.Add(port, site);
             }
             if (!Answer(moved.Take(), result, message)) return 0;
@@ -515,22 +545,23 @@ public:
     }
 
     RESULT zoom(const Str& left, const Str& right, Out& result, Msg& message) override {
-        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             const std::string a = left.c_str(), b = right.c_str();
             Region view;
             if (a == "fit") {
                 view = WholeDevice(plan.device);
             } else if (a == "block") {
                 const Block* block = FindBlock(plan, b);
-                if (!block) return Fail(message, "no block named " + Quote(b));
+                if (!block) return Refuse(state, message, Refusal::Unknown, {"BLOCK", b}, "no block named " + Quote(b));
                 const auto region = RegionOf(*block);
-                if (!region) return Fail(message, "block " + Quote(b) + " has no region to show");
+                if (!region)
+                    return Refuse(state, message, Refusal::Value, "block " + Quote(b) + " has no region to show");
                 view = ClampToDevice(*region, plan.device);
             } else {
                 const auto p = plan.device.ParseSite(a), q = plan.device.ParseSite(b);
                 if (!p || !q)
-                    return Fail(message,
-                                "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
+                    return Refuse(state, message, Refusal::Value,
+                                  "zoom needs two sites of the device, block NAME or fit, not '" + a + "' '" + b + "'");
                 view = Region{std::min(p->x, q->x), std::min(p->y, q->y), std::max(p->x, q->x), std::max(p->y, q->y)};
             }
             if (!Answer(ViewValue(plan, view), result, message)) return 0;
@@ -568,15 +599,16 @@ private:
     static FloorplanData* Ready(ToolState& state, Msg& message) {
         FloorplanData& plan = Plan(state);
         if (!plan.open) {
-            Fail(message, kNotOpen);
+            Refuse(state, message, Refusal::State, kNotOpen);
             return nullptr;
         }
         if (!state.CurrentDesign()) {
-            Fail(message, kNoProject);
+            Refuse(state, message, Refusal::NoProject, kNoProject);
             return nullptr;
         }
         if (plan.epoch != state.designEpoch) {
-            Fail(message, "the design changed since the floorplan was opened: close it with -nosave and open it again");
+            Refuse(state, message, Refusal::State,
+                   "the design changed since the floorplan was opened: close it with -nosave and open it again");
             return nullptr;
         }
         return &plan;
@@ -604,9 +636,10 @@ private:
 
     // A floorplan made from the current design, when none is open yet.
     static bool Start(ToolState& state, FloorplanData& fresh, Msg& message) {
-        if (Plan(state).open) return Fail(message, "the floorplan is open already: close it first") != 0;
+        if (Plan(state).open)
+            return Refuse(state, message, Refusal::State, "the floorplan is open already: close it first") != 0;
         const Design* design = state.CurrentDesign();
-        if (!design) return Fail(message, kNoProject) != 0;
+        if (!design) return Refuse(state, message, Refusal::NoProject, kNoProject) != 0;
         fresh.open = true;
         fresh.epoch = state.designEpoch;
         auto name = design->properties.find(kNameKey);
@@ -643,8 +676,9 @@ private:
         for (const Block& b : plan->constraints.blocks)
             if (auto r = RegionOf(b);
                 r && !(plan->device.OnDevice(r->x0, r->y0) && plan->device.OnDevice(r->x1, r->y1)))
-                return Fail(message, "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
-                                         RegionText(*r) + ", which reaches beyond the device") != 0;
+                return Refuse(state, message, Refusal::Value,
+                              "the floorplan cannot be saved: block " + Quote(b.name) + " has the region " +
+                                  RegionText(*r) + ", which reaches beyond the device") != 0;
         const Design& before = *project->GetDesign();
         Design design = before;
         design.device = plan->device;
@@ -666,9 +700,11 @@ private:
             design.properties[kClockLimitKey] = std::to_string(plan->clockLimit);
         else
             design.properties.erase(kClockLimitKey);
-        std::string problem = design.Index();
-        if (problem.empty()) project->Store(std::move(design), saved.changed, problem);
-        if (!problem.empty()) return Fail(message, "the floorplan cannot be saved: " + problem) != 0;
+        if (std::string problem = design.Index(); !problem.empty())
+            return Refuse(state, message, Refusal::Value, "the floorplan cannot be saved: " + problem) != 0;
+        if (std::string problem; !project->Store(std::move(design), saved.changed, problem))
+            return Refuse(state, message, Refusal::File, {project->File()},
+                          "the floorplan cannot be saved: " + problem) != 0;
         saved.file = project->File();
         if (moved) state.DesignChanged();
         plan->epoch = state.designEpoch;
@@ -688,9 +724,9 @@ private:
         return files;
     }
 
-    static RESULT Unknown(const std::string& key, Msg& message) {
-        return Fail(message,
-                    "no floorplan setting '" + key + "'; the settings are: open, " + Join(kFloorplanProperties));
+    static RESULT Unknown(const ToolState& state, const std::string& key, Msg& message) {
+        return Refuse(state, message, Refusal::Unknown, {"SETTING", key},
+                      "no floorplan setting '" + key + "'; the settings are: open, " + Join(kFloorplanProperties));
     }
 
     static const Block* FindBlock(const FloorplanData& plan, const std::string& name) {
@@ -699,16 +735,17 @@ private:
         return nullptr;
     }
 
-    static bool BlockNames(const FloorplanData& plan, const Prop& value, std::vector<std::string>& names,
-                           Msg& message) {
-        if (!WordsOf(value, names)) return Fail(message, "the blocks are no proper list") != 0;
-        if (names.empty()) return Fail(message, "no block given") != 0;
+    static bool BlockNames(const ToolState& state, const FloorplanData& plan, const Prop& value,
+                           std::vector<std::string>& names, Msg& message) {
+        if (!WordsOf(value, names)) return Refuse(state, message, Refusal::Value, "the blocks are no proper list") != 0;
+        if (names.empty()) return Refuse(state, message, Refusal::Value, "no block given") != 0;
         for (const std::string& n : names)
             if (!FindBlock(plan, n)) {
                 const auto all = BlockList(plan.constraints);
-                return Fail(message, "no block named " + Quote(n) +
-                                         (all.empty() ? std::string("; the floorplan has no blocks")
-                                                      : "; the blocks are: " + Join(all))) != 0;
+                return Refuse(state, message, Refusal::Unknown, {"BLOCK", n},
+                              "no block named " + Quote(n) +
+                                  (all.empty() ? std::string("; the floorplan has no blocks")
+                                               : "; the blocks are: " + Join(all))) != 0;
             }
         return true;
     }
@@ -736,10 +773,10 @@ private:
     }
 
     RESULT SwitchSites(const Prop& sites, bool prohibit, Out& result, Msg& message) {
-        return OnPlan(message, [&](ToolState&, FloorplanData& plan) -> RESULT {
+        return OnPlan(message, [&](ToolState& state, FloorplanData& plan) -> RESULT {
             std::vector<std::string> words;
-            if (!WordsOf(sites, words)) return Fail(message, "the sites are no proper list");
-            if (words.empty()) return Fail(message, "no site given");
+            if (!WordsOf(sites, words)) return Refuse(state, message, Refusal::Value, "the sites are no proper list");
+            if (words.empty()) return Refuse(state, message, Refusal::Value, "no site given");
             std::set<std::string> changed = plan.constraints.prohibited;
             for (const std::string& w : words) {
                 Region r;
@@ -747,11 +784,13 @@ private:
                 const bool range = w.find(':') != std::string::npos;
                 int x = 0, y = 0;
                 if (range ? !ParseRegion(w, r, error) : !ParseSiteName(w, x, y))
-                    return Fail(message, Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
+                    return Refuse(state, message, Refusal::Value,
+                                  Quote(w) + " is no site: give X<col>Y<row> or a range X0Y0:X1Y1");
                 if (!range) r = Region{x, y, x, y};
                 if (!plan.device.OnDevice(r.x0, r.y0) || !plan.device.OnDevice(r.x1, r.y1))
-                    return Fail(message, Quote(w) + " is not on the device (" + std::to_string(plan.device.columns) +
-                                             " x " + std::to_string(plan.device.rows) + " sites)");
+                    return Refuse(state, message, Refusal::Value,
+                                  Quote(w) + " is not on the device (" + std::to_string(plan.device.columns) + " x " +
+                                      std::to_string(plan.device.rows) + " sites)");
                 if (!prohibit) {
                     // A walk over what is prohibited, not over the range, which may be huge.
                     std::erase_if(changed, [&r](const std::string& site) {
@@ -761,14 +800,16 @@ private:
                     continue;
                 }
                 if (r.Sites() > kMaxProhibited)
-                    return Fail(message, Quote(w) + " covers " + std::to_string(r.Sites()) +
-                                             " sites; a floorplan prohibits at most " +
-                                             std::to_string(kMaxProhibited) + " sites");
+                    return Refuse(state, message, Refusal::Limit,
+                                  Quote(w) + " covers " + std::to_string(r.Sites()) +
+                                      " sites; a floorplan prohibits at most " + std::to_string(kMaxProhibited) +
+                                      " sites");
                 for (int yy = r.y0; yy <= r.y1; ++yy)
                     for (int xx = r.x0; xx <= r.x1; ++xx) changed.insert(Device::SiteName(xx, yy));
                 if (static_cast<long long>(changed.size()) > kMaxProhibited)
-                    return Fail(message, "the floorplan would prohibit " + std::to_string(changed.size()) +
-                                             " sites, more than " + std::to_string(kMaxProhibited));
+                    return Refuse(state, message, Refusal::Limit,
+                                  "the floorplan would prohibit " + std::to_string(changed.size()) +
+                                      " sites, more than " + std::to_string(kMaxProhibited));
             }
             if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
             plan.constraints.prohibited = std::move(changed);

@@ -22,16 +22,22 @@ Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors) {
     });
 }
 
-CommonI::RESULT SetSetting(SettingTable& table, const std::string& name, const std::string& text, bool allowNew,
-                           UtilI::MITclProperty& result, Port_String& message) {
-    if (std::string error = table.Set(name, text, allowNew); !error.empty()) return Fail(message, error);
+CommonI::RESULT SetSetting(const ToolState& state, SettingTable& table, const std::string& name,
+                           const std::string& text, bool allowNew, UtilI::MITclProperty& result, Port_String& message) {
+    if (std::string error = table.Set(name, text, allowNew); !error.empty()) {
+        if (!allowNew && table.Find(name) == nullptr)
+            return Refuse(state, message, Refusal::Unknown, {"SETTING", name}, error);
+        return Refuse(state, message, Refusal::Value, error);
+    }
     return Answer(NewText(table.Find(name)->value), result, message);
 }
 
-CommonI::RESULT GetSetting(const SettingTable& table, const std::string& name, const char* what,
+CommonI::RESULT GetSetting(const ToolState& state, const SettingTable& table, const std::string& name, const char* what,
                            UtilI::MITclProperty& result, Port_String& message) {
     const Setting* setting = table.Find(name);
-    if (setting == nullptr) return Fail(message, std::string("unknown ") + what + " '" + name + "'");
+    if (setting == nullptr)
+        return Refuse(state, message, Refusal::Unknown, {"SETTING", name},
+                      std::string("unknown ") + what + " '" + name + "'");
     return Answer(NewText(setting->value), result, message);
 }
 
@@ -43,12 +49,13 @@ public:
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        return SetSetting(m_state->settings, name.c_str(), TextOf(value), true, result, message);
+        return SetSetting(*m_state, m_state->settings, name.c_str(), TextOf(value), true, result, message);
     }
 
     CommonI::RESULT unset(const Str& name, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        if (std::string error = m_state->settings.Unset(name.c_str()); !error.empty()) return Fail(message, error);
+        if (std::string error = m_state->settings.Unset(name.c_str()); !error.empty())
+            return Refuse(*m_state, message, Refusal::Unknown, {"SETTING", name.c_str()}, error);
         const Setting* restored = m_state->settings.Find(name.c_str());
         if (restored == nullptr) return 1;  // a script's own setting is gone
         return Answer(NewText(restored->value), result, message);
@@ -56,7 +63,7 @@ public:
 
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        return GetSetting(m_state->settings, name.c_str(), "setting", result, message);
+        return GetSetting(*m_state, m_state->settings, name.c_str(), "setting", result, message);
     }
 
     CommonI::RESULT properties(Out& result, Msg& message) override {

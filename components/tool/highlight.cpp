@@ -45,13 +45,13 @@ public:
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        return SetSetting(m_state->highlightSettings, name.c_str(), TextOf(value), false, result, message);
+        return SetSetting(*m_state, m_state->highlightSettings, name.c_str(), TextOf(value), false, result, message);
     }
 
     // Answers without an open project: the default of `highlight add -color` asks on every call.
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        return GetSetting(m_state->highlightSettings, name.c_str(), "highlight setting", result, message);
+        return GetSetting(*m_state, m_state->highlightSettings, name.c_str(), "highlight setting", result, message);
     }
 
     CommonI::RESULT properties(bool descriptors, Out& result, Msg& message) override {
@@ -64,14 +64,17 @@ private:
         std::string colour = color.c_str();
         if (colour.empty()) colour = m_state->highlightSettings.Find("default_highlight_color")->value;
         auto canonical = CanonicalColor(colour);
-        if (!canonical) return Fail(message, "bad colour '" + colour + "': expected a colour name or #rrggbb");
+        if (!canonical)
+            return Refuse(*m_state, message, Refusal::Value,
+                          "bad colour '" + colour + "': expected a colour name or #rrggbb");
         std::vector<std::string> names;
         if (!ResolveItems(*m_state, items, names, message)) return 0;
         auto marked = replace ? std::map<std::string, std::string>{} : m_state->highlight;
         for (const std::string& name : names) marked[name] = *canonical;
         if (std::size_t limit = MaxItems(m_state->highlightSettings); limit != 0 && marked.size() > limit)
-            return Fail(message, "the highlight would hold " + std::to_string(marked.size()) + " objects, more than max_items " +
-                                     std::to_string(limit));
+            return Refuse(*m_state, message, Refusal::Limit,
+                          "the highlight would hold " + std::to_string(marked.size()) +
+                              " objects, more than max_items " + std::to_string(limit));
         m_state->highlight = std::move(marked);
         return Answer(NewInt(static_cast<long long>(m_state->highlight.size())), result, message);
     }

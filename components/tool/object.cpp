@@ -81,7 +81,8 @@ public:
         const Properties all = *m_state->CurrentDesign()->PropertiesOf(found);
         auto it = all.find(property.c_str());
         if (it == all.end())
-            return Fail(message, "object '" + found + "' has no property '" + property.c_str() + "'");
+            return Refuse(*m_state, message, Refusal::Unknown, {"PROPERTY", property.c_str()},
+                          "object '" + found + "' has no property '" + property.c_str() + "'");
         return Answer(NewText(it->second), result, message);
     }
 
@@ -111,7 +112,7 @@ private:
     // The one object a word names: a plain name, or a collection or list that holds exactly one.
     bool One(const Prop& object, std::string& found, Msg& message) const {
         const Design* design = m_state->CurrentDesign();
-        if (design == nullptr) return Fail(message, kNoProject);
+        if (design == nullptr) return Refuse(*m_state, message, Refusal::NoProject, kNoProject);
         const std::string text = TextOf(object);
         if (design->Find(text)) {
             found = text;
@@ -122,7 +123,8 @@ private:
         TclValue value(NewText(text));
         if (!ResolveObjects(*m_state, value.get(), names, error)) return Fail(message, error);
         if (names.size() != 1)
-            return Fail(message, "expected one object, but '" + text + "' names " + std::to_string(names.size()));
+            return Refuse(*m_state, message, Refusal::Value,
+                          "expected one object, but '" + text + "' names " + std::to_string(names.size()));
         found = names.front();
         return true;
     }

@@ -19,10 +19,10 @@ CitI::IInterface* NewSearch(const StatePtr& state);
 // descriptors a list of dicts with name, type, description and value.
 Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors);
 // Sets one setting of a table (a new one too, when `allowNew`) and answers with its canonical value.
-CommonI::RESULT SetSetting(SettingTable& table, const std::string& name, const std::string& text, bool allowNew,
-                           UtilI::MITclProperty& result, Port_String& message);
+CommonI::RESULT SetSetting(const ToolState& state, SettingTable& table, const std::string& name,
+                           const std::string& text, bool allowNew, UtilI::MITclProperty& result, Port_String& message);
 // Answers with the value of one setting; `what` names the setting's kind in the failure text.
-CommonI::RESULT GetSetting(const SettingTable& table, const std::string& name, const char* what,
+CommonI::RESULT GetSetting(const ToolState& state, const SettingTable& table, const std::string& name, const char* what,
                            UtilI::MITclProperty& result, Port_String& message);
 
 }  // namespace kelmartool

@@ -74,42 +74,47 @@ public:
                            const List& in, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
         const Design* design = m_state->CurrentDesign();
-        if (design == nullptr) return Fail(message, kNoProject);
+        if (design == nullptr) return Refuse(*m_state, message, Refusal::NoProject, kNoProject);
         const bool byExpression = regexp || exp;
-        if (exactmatch && byExpression) return Fail(message, "search takes -exactmatch or -regexp, not both");
+        if (exactmatch && byExpression)
+            return Refuse(*m_state, message, Refusal::Value, "search takes -exactmatch or -regexp, not both");
 
         std::set<Kind> kinds;
         std::vector<std::string> words;
-        if (!WordsOf(type, words)) return Fail(message, "-type expects object kinds");
+        if (!WordsOf(type, words)) return Refuse(*m_state, message, Refusal::Value, "-type expects object kinds");
         for (const std::string& w : words) {
             if (w == "all") {
                 kinds.insert(std::begin(kAllKinds), std::end(kAllKinds));
             } else if (auto kind = KindFromWord(w)) {
                 kinds.insert(*kind);
             } else {
-                return Fail(message, "unknown object type '" + w + "': expected all, cell, net, port, clock, bank or site");
+                return Refuse(*m_state, message, Refusal::Value,
+                              "unknown object type '" + w + "': expected all, cell, net, port, clock, bank or site");
             }
         }
 
         std::vector<std::string> scopes;
-        if (!WordsOf(in, scopes)) return Fail(message, "-in expects scopes");
+        if (!WordsOf(in, scopes)) return Refuse(*m_state, message, Refusal::Value, "-in expects scopes");
         for (const std::string& scope : scopes)
             if (scope != "project" && scope != "selection" && scope != "highlight" && !m_state->collections.count(scope))
-                return Fail(message, "unknown search scope '" + scope +
-                                         "': expected project, selection, highlight or the name of a collection");
+                return Refuse(*m_state, message, Refusal::Value,
+                              "unknown search scope '" + scope +
+                                  "': expected project, selection, highlight or the name of a collection");
 
         Tcl_RegExp expression = nullptr;
         TclValue pattern(NewText(text.c_str()));
         if (byExpression) {
             if (text.Length() > static_cast<int32_t>(kLongestExpression))
-                return Fail(message, "a regular expression of at most " + std::to_string(kLongestExpression) +
-                                         " characters is taken, not " + std::to_string(text.Length()));
+                return Refuse(*m_state, message, Refusal::Limit,
+                              "a regular expression of at most " + std::to_string(kLongestExpression) +
+                                  " characters is taken, not " + std::to_string(text.Length()));
             const int flags = TCL_REG_ADVANCED | (matchcase ? 0 : TCL_REG_NOCASE);
             expression = Tcl_GetRegExpFromObj(m_state->interp, pattern.get(), flags);
             if (expression == nullptr) {
                 std::string why = Tcl_GetStringResult(m_state->interp);
                 Tcl_ResetResult(m_state->interp);
-                return Fail(message, "bad regular expression '" + std::string(text.c_str()) + "': " + why);
+                return Refuse(*m_state, message, Refusal::Value,
+                              "bad regular expression '" + std::string(text.c_str()) + "': " + why);
             }
         }
 
@@ -148,11 +153,12 @@ public:
                                                 ? std::nullopt
                                                 : OfferSites(design->device, offer);
                         if (!walked)
-                            return Fail(message, "search would test more than " + std::to_string(kMostSitesTested) +
-                                                     " of the " + std::to_string(SiteCount(design->device)) +
-                                                     " sites of the device against '" + text.c_str() +
-                                                     "': name one site, leave sites out with -type, or set "
-                                                     "search_limit");
+                            return Refuse(*m_state, message, Refusal::Limit,
+                                          "search would test more than " + std::to_string(kMostSitesTested) +
+                                              " of the " + std::to_string(SiteCount(design->device)) +
+                                              " sites of the device against '" + text.c_str() +
+                                              "': name one site, leave sites out with -type, or set "
+                                              "search_limit");
                         more = *walked;
                     }
                 }

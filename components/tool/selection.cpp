@@ -46,12 +46,12 @@ public:
 
     CommonI::RESULT set(const Str& name, const Prop& value, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        return SetSetting(m_state->selectionSettings, name.c_str(), TextOf(value), false, result, message);
+        return SetSetting(*m_state, m_state->selectionSettings, name.c_str(), TextOf(value), false, result, message);
     }
 
     CommonI::RESULT get(const Str& name, Out& result, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
-        return GetSetting(m_state->selectionSettings, name.c_str(), "selection setting", result, message);
+        return GetSetting(*m_state, m_state->selectionSettings, name.c_str(), "selection setting", result, message);
     }
 
     CommonI::RESULT properties(bool descriptors, Out& result, Msg& message) override {
@@ -67,14 +67,16 @@ private:
         const Design& design = *m_state->CurrentDesign();
         for (const std::string& name : names)
             if (filter != "all" && design.TypeOf(name) != filter)
-                return Fail(message, "'" + name + "' is a " + design.TypeOf(name) + ", but the selection filter admits only " +
-                                         filter + " objects");
+                return Refuse(*m_state, message, Refusal::Value,
+                              "'" + name + "' is a " + design.TypeOf(name) + ", but the selection filter admits only " +
+                                  filter + " objects");
         auto selected = replace ? std::vector<std::string>{} : m_state->selection;
         for (std::string& name : names)
             if (std::find(selected.begin(), selected.end(), name) == selected.end()) selected.push_back(std::move(name));
         if (std::size_t limit = MaxItems(m_state->selectionSettings); limit != 0 && selected.size() > limit)
-            return Fail(message, "the selection would hold " + std::to_string(selected.size()) + " objects, more than max_items " +
-                                     std::to_string(limit));
+            return Refuse(*m_state, message, Refusal::Limit,
+                          "the selection would hold " + std::to_string(selected.size()) +
+                              " objects, more than max_items " + std::to_string(limit));
         m_state->selection = std::move(selected);
         return Answer(NewList(m_state->selection), result, message);
     }

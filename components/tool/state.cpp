@@ -77,10 +77,46 @@ bool Alive(const ToolState& state, Port_String& message) {
     return state.interp != nullptr || Fail(message, kStateGone) != 0;
 }
 
+namespace {
+
+const char* RefusalWord(Refusal kind) {
+    switch (kind) {
+        case Refusal::NoProject: return "NOPROJECT";
+        case Refusal::Unknown: return "UNKNOWN";
+        case Refusal::File: return "FILE";
+        case Refusal::State: return "STATE";
+        case Refusal::Limit: return "LIMIT";
+        case Refusal::Value: return "VALUE";
+        case Refusal::Script: return "SCRIPT";
+    }
+    return "VALUE";
+}
+
+}  // namespace
+
+void SetRefusal(const ToolState& state, Refusal kind, std::initializer_list<std::string_view> more) {
+    if (state.interp == nullptr) return;
+    Tcl_Obj* code = NewList({NewText("KELMAR"), NewText("TOOL"), NewText(RefusalWord(kind))});
+    for (std::string_view word : more) Tcl_ListObjAppendElement(nullptr, code, NewText(word));
+    Tcl_SetObjErrorCode(state.interp, code);
+}
+
+CommonI::RESULT Refuse(const ToolState& state, Port_String& message, Refusal kind, const std::string& text) {
+    SetRefusal(state, kind);
+    return Fail(message, text);
+}
+
+CommonI::RESULT Refuse(const ToolState& state, Port_String& message, Refusal kind,
+                       std::initializer_list<std::string_view> more, const std::string& text) {
+    SetRefusal(state, kind, more);
+    return Fail(message, text);
+}
+
 const std::vector<std::string>* ResolveView(const ToolState& state, Tcl_Obj* value, std::vector<std::string>& own,
                                             std::string& error) {
     const Design* design = state.CurrentDesign();
     if (design == nullptr) {
+        SetRefusal(state, Refusal::NoProject);
         error = kNoProject;
         return nullptr;
     }
@@ -90,6 +126,7 @@ const std::vector<std::string>* ResolveView(const ToolState& state, Tcl_Obj* val
     int count = 0;
     Tcl_Obj** items = nullptr;
     if (Tcl_ListObjGetElements(nullptr, value, &count, &items) != TCL_OK) {
+        SetRefusal(state, Refusal::Value);
         error = std::string("'") + whole + "' is neither a collection nor a list of objects";
         return nullptr;
     }
@@ -100,6 +137,7 @@ const std::vector<std::string>* ResolveView(const ToolState& state, Tcl_Obj* val
         } else if (design->Find(word)) {
             own.emplace_back(word);
         } else {
+            SetRefusal(state, Refusal::Unknown, {"OBJECT", word});
             error = "unknown object '" + std::string(word) + "'";
             return nullptr;
         }

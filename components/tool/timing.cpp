@@ -208,7 +208,7 @@ public:
     RESULT delete_(const Str& analysis, Out& result, Msg& message) override {
         return m_state.On(message, [&](ToolState& state) -> RESULT {
             TimingData& data = Data(state);
-            if (!Find(data, analysis, message)) return 0;
+            if (!Find(state, analysis, message)) return 0;
             std::vector<std::string> left;
             for (const auto& [id, a] : data.analyses)
                 if (id != analysis.c_str()) left.push_back(id);
@@ -235,7 +235,7 @@ public:
             const std::string key = name.c_str();
             for (const Descriptor& d : kSettings)
                 if (key == d.name) return Answer(d.value(state, a), result, message);
-            return UnknownSetting(key, message);
+            return UnknownSetting(state, key, message);
         });
     }
 
@@ -247,9 +247,11 @@ public:
         return m_state.On(message, [&](ToolState& state) -> RESULT {
             const std::string id = analysis.c_str();
             if (id.empty() || id.find_first_of(" \t\n") != std::string::npos)
-                return Fail(message, "the name of a timing analysis must be one word, not '" + id + "'");
+                return Refuse(state, message, Refusal::Value,
+                              "the name of a timing analysis must be one word, not '" + id + "'");
             TimingData& data = Data(state);
-            if (data.analyses.count(id)) return Fail(message, "a timing analysis named '" + id + "' exists already");
+            if (data.analyses.count(id))
+                return Refuse(state, message, Refusal::Value, "a timing analysis named '" + id + "' exists already");
             Analysis a;
             a.id = id;
             a.name = name.IsEmpty() ? id : std::string(name.c_str());
@@ -270,15 +272,16 @@ public:
     RESULT run(const Str& analysis, bool overwrite, Out& result, Msg& message) override {
         return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             const Design* design = state.CurrentDesign();
-            if (!design) return Fail(message, kNoProject);
+            if (!design) return Refuse(state, message, Refusal::NoProject, kNoProject);
             if (a.result && !overwrite)
-                return Fail(message, "timing analysis '" + a.id +
-                                         "' has a result already: run it with -overwrite to replace the result");
+                return Refuse(state, message, Refusal::State,
+                              "timing analysis '" + a.id +
+                                  "' has a result already: run it with -overwrite to replace the result");
             const int pathLimit = static_cast<int>(state.settings.Integer("max_paths", 0));
             TimingResult fresh;
             std::string error;
             if (!RunTiming(*design, a.settings, pathLimit, fresh, error))
-                return Fail(message, "timing analysis '" + a.id + "' failed: " + error);
+                return Refuse(state, message, Refusal::Value, "timing analysis '" + a.id + "' failed: " + error);
             fresh.epoch = state.designEpoch;
             std::optional<TimingResult> previous = std::move(a.result);
             a.result = std::move(fresh);
@@ -300,18 +303,19 @@ public:
     }
 
     RESULT set(const Str& analysis, const Str& name, const Prop& value, Out& result, Msg& message) override {
-        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             const std::string key = name.c_str();
             const std::string text = TextOf(value);
             std::string* target = key == "name" ? &a.name : key == "description" ? &a.description : nullptr;
             if (!target) {
                 for (const Descriptor& d : kSettings)
                     if (key == d.name)
-                        return Fail(message, "the setting '" + key + "' of a timing analysis is read-only");
-                return UnknownSetting(key, message);
+                        return Refuse(state, message, Refusal::Value,
+                                      "the setting '" + key + "' of a timing analysis is read-only");
+                return UnknownSetting(state, key, message);
             }
             if (key == "name" && text.empty())
-                return Fail(message, "the display name of a timing analysis cannot be empty");
+                return Refuse(state, message, Refusal::Value, "the display name of a timing analysis cannot be empty");
             if (!Answer(NewText(text), result, message)) return 0;
             *target = text;
             return 1;
@@ -323,7 +327,8 @@ public:
             const std::string key = name.c_str();
             const std::string text = TextOf(value);
             std::string error = CheckConstraint(state, key, text);
-            if (!error.empty()) return Fail(message, error);
+            if (!error.empty())
+                return Refuse(state, message, error == kNoProject ? Refusal::NoProject : Refusal::Value, error);
             TimingSettings changed = a.settings;
             changed.constraints[key] = TimingSettings::Constraint{text, true};
             return Commit(a, std::move(changed), ConstraintsValue, result, message);
@@ -334,23 +339,27 @@ public:
                          Msg& message) override {
         return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             const std::string k = kind.c_str(), s = side.c_str();
-            if (k != "from" && k != "to") return Fail(message, "unknown endpoint kind '" + k + "': use from or to");
+            if (k != "from" && k != "to")
+                return Refuse(state, message, Refusal::Value, "unknown endpoint kind '" + k + "': use from or to");
             if (s != "only" && s != "except")
-                return Fail(message, "unknown endpoint side '" + s + "': use only or except");
+                return Refuse(state, message, Refusal::Value, "unknown endpoint side '" + s + "': use only or except");
             std::vector<std::string> items;
-            if (!WordsOf(endpoints, items)) return Fail(message, "the endpoints are no proper list");
+            if (!WordsOf(endpoints, items))
+                return Refuse(state, message, Refusal::Value, "the endpoints are no proper list");
             const Design* design = state.CurrentDesign();
-            if (!design) return Fail(message, kNoProject);
+            if (!design) return Refuse(state, message, Refusal::NoProject, kNoProject);
             for (const std::string& item : items) {
                 const Cell* cell = design->FindCell(item);
                 const IoPort* port = design->FindPort(item);
                 const bool fits = (cell && cell->sequential) || (port && port->output == (k == "to"));
                 if (!fits)
-                    return Fail(message, "'" + item + "' is no " + (k == "from" ? "start" : "end") + " point: use " +
-                                             (k == "from" ? "input" : "output") + " ports and sequential cells");
+                    return Refuse(state, message, Refusal::Value,
+                                  "'" + item + "' is no " + (k == "from" ? "start" : "end") + " point: use " +
+                                      (k == "from" ? "input" : "output") + " ports and sequential cells");
             }
             if (items.empty() && s == "only")
-                return Fail(message, "set_endpoints " + k + " only needs at least one endpoint");
+                return Refuse(state, message, Refusal::Value,
+                              "set_endpoints " + k + " only needs at least one endpoint");
             TimingSettings changed = a.settings;
             if (items.empty())
                 changed.endpoints.erase(k);
@@ -362,20 +371,24 @@ public:
 
     RESULT set_query(const Str& analysis, const Str& kind, const List& items, int32_t ld, int32_t hf, Out& result,
                      Msg& message) override {
-        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             const std::string k = kind.c_str();
             if (k != "paths" && k != "fanout")
-                return Fail(message, "unknown query kind '" + k + "': use paths or fanout");
-            if (ld < 0 || hf < 0) return Fail(message, "-ld and -hf cannot be negative");
+                return Refuse(state, message, Refusal::Value, "unknown query kind '" + k + "': use paths or fanout");
+            if (ld < 0 || hf < 0) return Refuse(state, message, Refusal::Value, "-ld and -hf cannot be negative");
             std::vector<std::string> words;
-            if (!WordsOf(items, words)) return Fail(message, "the query items are no proper list");
-            if (words.empty()) return Fail(message, "a " + k + " query needs at least one item");
+            if (!WordsOf(items, words))
+                return Refuse(state, message, Refusal::Value, "the query items are no proper list");
+            if (words.empty())
+                return Refuse(state, message, Refusal::Value, "a " + k + " query needs at least one item");
             if (k == "paths") {
                 for (const std::string& w : words)
                     if (w != "*" && std::find(kPathFields.begin(), kPathFields.end(), w) == kPathFields.end())
-                        return Fail(message, "unknown path field '" + w + "': use * or " + Join(kPathFields));
+                        return Refuse(state, message, Refusal::Value,
+                                      "unknown path field '" + w + "': use * or " + Join(kPathFields));
             } else if (hf < 1) {
-                return Fail(message, "a fanout query needs -hf N, the least fanout it reports");
+                return Refuse(state, message, Refusal::Value,
+                              "a fanout query needs -hf N, the least fanout it reports");
             }
             TimingSettings changed = a.settings;
             changed.queries[k] = TimingSettings::Query{words, ld, hf};
@@ -385,25 +398,28 @@ public:
 
     RESULT set_filter(const Str& analysis, const Str& kind, const Str& mode, const List& items, Out& result,
                       Msg& message) override {
-        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             const std::string k = kind.c_str(), m = mode.c_str();
             static const std::vector<std::string> kinds{"startpoint", "endpoint", "clock", "through", "slack"};
             if (std::find(kinds.begin(), kinds.end(), k) == kinds.end())
-                return Fail(message, "unknown filter kind '" + k + "': use " + Join(kinds));
+                return Refuse(state, message, Refusal::Value, "unknown filter kind '" + k + "': use " + Join(kinds));
             const bool slack = k == "slack";
             if (m != "clear" && (slack ? m != "below" && m != "above" : m != "include" && m != "exclude"))
-                return Fail(message, "unknown mode '" + m + "' of the " + k + " filter: use " +
-                                         (slack ? "below, above or clear" : "include, exclude or clear"));
+                return Refuse(state, message, Refusal::Value,
+                              "unknown mode '" + m + "' of the " + k + " filter: use " +
+                                  (slack ? "below, above or clear" : "include, exclude or clear"));
             std::vector<std::string> words;
-            if (!WordsOf(items, words)) return Fail(message, "the filter items are no proper list");
+            if (!WordsOf(items, words))
+                return Refuse(state, message, Refusal::Value, "the filter items are no proper list");
             TimingSettings changed = a.settings;
             if (m == "clear") {
                 changed.filters.erase(k);
             } else {
                 double bound = 0;
                 if (slack && (words.size() != 1 || !IsNumber(words.front(), bound)))
-                    return Fail(message, "the slack filter needs one number");
-                if (words.empty()) return Fail(message, "the " + k + " filter needs at least one pattern");
+                    return Refuse(state, message, Refusal::Value, "the slack filter needs one number");
+                if (words.empty())
+                    return Refuse(state, message, Refusal::Value, "the " + k + " filter needs at least one pattern");
                 if (slack) words.front() = Number(bound);
                 changed.filters[k] = TimingSettings::Filter{m, words};
             }
@@ -422,7 +438,7 @@ private:
     template <class Op>
     RESULT OnAnalysis(const Str& analysis, Msg& message, Op op) {
         return m_state.On(message, [&](ToolState& state) -> RESULT {
-            Analysis* a = Find(Data(state), analysis, message);
+            Analysis* a = Find(state, analysis, message);
             return a ? op(state, *a) : 0;
         });
     }
@@ -432,21 +448,23 @@ private:
         return *state.timing;
     }
 
-    static Analysis* Find(TimingData& data, const Str& analysis, Msg& message) {
+    static Analysis* Find(ToolState& state, const Str& analysis, Msg& message) {
+        TimingData& data = Data(state);
         auto it = data.analyses.find(analysis.c_str());
         if (it != data.analyses.end()) return &it->second;
         std::vector<std::string> ids;
         for (const auto& [id, a] : data.analyses) ids.push_back(id);
-        Fail(message,
-             "no timing analysis named '" + std::string(analysis.c_str()) + "'" +
-                 (ids.empty() ? std::string(": make one with timing new NAME") : "; the analyses are: " + Join(ids)));
+        Refuse(state, message, Refusal::Unknown, {"ANALYSIS", analysis.c_str()},
+               "no timing analysis named '" + std::string(analysis.c_str()) + "'" +
+                   (ids.empty() ? std::string(": make one with timing new NAME") : "; the analyses are: " + Join(ids)));
         return nullptr;
     }
 
-    static RESULT UnknownSetting(const std::string& key, Msg& message) {
+    static RESULT UnknownSetting(const ToolState& state, const std::string& key, Msg& message) {
         std::vector<std::string> names;
         for (const Descriptor& d : kSettings) names.push_back(d.name);
-        return Fail(message, "no setting '" + key + "' in a timing analysis; the settings are: " + Join(names));
+        return Refuse(state, message, Refusal::Unknown, {"SETTING", key},
+                      "no setting '" + key + "' in a timing analysis; the settings are: " + Join(names));
     }
 
     static Tcl_Obj* Settings(const ToolState& state, const Analysis& a) {
@@ -520,14 +538,16 @@ private:
     }
 
     RESULT SwitchConstraints(const Str& analysis, const List& constraints, bool enabled, Out& result, Msg& message) {
-        return OnAnalysis(analysis, message, [&](ToolState&, Analysis& a) -> RESULT {
+        return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             std::vector<std::string> names;
-            if (!WordsOf(constraints, names)) return Fail(message, "the constraint names are no proper list");
+            if (!WordsOf(constraints, names))
+                return Refuse(state, message, Refusal::Value, "the constraint names are no proper list");
             TimingSettings changed = a.settings;
             for (const std::string& n : names) {
                 auto it = changed.constraints.find(n);
                 if (it == changed.constraints.end())
-                    return Fail(message, "timing analysis '" + a.id + "' has no constraint '" + n + "'");
+                    return Refuse(state, message, Refusal::Unknown, {"CONSTRAINT", n},
+                                  "timing analysis '" + a.id + "' has no constraint '" + n + "'");
                 it->second.enabled = enabled;
             }
             return Commit(a, std::move(changed), ConstraintsValue, result, message);
@@ -540,16 +560,17 @@ private:
             const auto objectKind = KindFromWord(k);
             if (!objectKind || (*objectKind != Kind::Cell && *objectKind != Kind::Port && *objectKind != Kind::Net &&
                                 *objectKind != Kind::Clock))
-                return Fail(message, "unknown kind '" + k + "': use cell, port, net or clock");
+                return Refuse(state, message, Refusal::Value, "unknown kind '" + k + "': use cell, port, net or clock");
             std::vector<std::string> words;
-            if (!WordsOf(items, words)) return Fail(message, "the items are no proper list");
+            if (!WordsOf(items, words)) return Refuse(state, message, Refusal::Value, "the items are no proper list");
             const Design* design = state.CurrentDesign();
-            if (!design) return Fail(message, kNoProject);
+            if (!design) return Refuse(state, message, Refusal::NoProject, kNoProject);
             TimingSettings changed = a.settings;
             auto& set = changed.disabled[k];
             for (const std::string& w : words) {
                 const auto ref = design->Find(w);
-                if (!ref || ref->kind != *objectKind) return Fail(message, "'" + w + "' is no " + k + " of the design");
+                if (!ref || ref->kind != *objectKind)
+                    return Refuse(state, message, Refusal::Value, "'" + w + "' is no " + k + " of the design");
                 if (enabled)
                     set.erase(w);
                 else
@@ -562,9 +583,11 @@ private:
 
     RESULT WriteReport(const Str& analysis, const Str& file, Out& result, Msg& message) {
         return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
-            if (!a.result) return Fail(message, "timing analysis '" + a.id + "' has no result: run it first");
+            if (!a.result)
+                return Refuse(state, message, Refusal::State,
+                              "timing analysis '" + a.id + "' has no result: run it first");
             const std::string path = file.c_str();
-            if (path.empty()) return Fail(message, "the report needs a file name");
+            if (path.empty()) return Refuse(state, message, Refusal::Value, "the report needs a file name");
             std::ostringstream text;
             const TimingResult& r = *a.result;
             text << "Timing analysis " << a.id << " (" << a.name << ")\n";
@@ -588,7 +611,8 @@ private:
                 for (const FanoutNet& n : r.highFanout) text << "  " << n.net << " " << n.fanout << "\n";
             }
             if (std::string why; !WriteTextFile(path, text.str(), why))
-                return Fail(message, "cannot write the timing report to '" + path + "': " + why);
+                return Refuse(state, message, Refusal::File, {path},
+                              "cannot write the timing report to '" + path + "': " + why);
             return Answer(NewText(path), result, message);
         });
     }

@@ -126,9 +126,17 @@ int OpenCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[])
         CommonI::RefCountPtr<TcltaskI::ITclProjectMgr> manager(static_cast<TcltaskI::ITclProjectMgr*>(
             kelmartool::NewProjectManager(state)->GetInterface(TcltaskI::ITclProjectMgrID)));
         Port_String message;
-        const CommonI::RESULT ok = manager->Open(Tcl_GetString(objv[1]), message);
+        const char* file = Tcl_GetString(objv[1]);
+        const CommonI::RESULT ok = manager->Open(file, message);
         Tcl_SetObjResult(interp, Tcl_NewStringObj(message.c_str(), message.Length()));
-        return ok == 1 ? TCL_OK : TCL_ERROR;
+        if (ok == 1) return TCL_OK;
+        // The manager answers its failures as values, with no error code: a file is refused when it
+        // cannot be read or understood, and only an empty word is no file at all.
+        if (file[0] == '\0')
+            kelmartool::SetRefusal(*state, kelmartool::Refusal::Value);
+        else
+            kelmartool::SetRefusal(*state, kelmartool::Refusal::File, {file});
+        return TCL_ERROR;
     } catch (const std::exception& e) {
         Tcl_SetObjResult(interp, Tcl_ObjPrintf("cannot open the project file: %s", e.what()));
         return TCL_ERROR;

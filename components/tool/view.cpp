@@ -96,27 +96,32 @@ public:
                          Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
         const Design* d = m_state->CurrentDesign();
-        if (d == nullptr) return Fail(message, kNoProject);
+        if (d == nullptr) return Refuse(*m_state, message, Refusal::NoProject, kNoProject);
         if (int(full) + int(selection) + int(last) + int(Given(name)) + int(Given(range)) > 1)
-            return Fail(message, "zoom takes at most one of -full, -selection, -last, -name and -range");
-        if (int(in) + int(out) + int(detailed) > 1) return Fail(message, "zoom takes at most one of -in, -out and -detailed");
+            return Refuse(*m_state, message, Refusal::Value,
+                          "zoom takes at most one of -full, -selection, -last, -name and -range");
+        if (int(in) + int(out) + int(detailed) > 1)
+            return Refuse(*m_state, message, Refusal::Value, "zoom takes at most one of -in, -out and -detailed");
 
         Viewport v = Shown();
         if (full) v = Whole(*d);
         if (selection) {
             auto box = BoxOfAll(*d, m_state->selection);
-            if (!box) return Fail(message, "the selection holds no placed object to zoom to");
+            if (!box)
+                return Refuse(*m_state, message, Refusal::State, "the selection holds no placed object to zoom to");
             v = FromBox(*box);
         }
         if (last) {
-            if (m_state->view.position == 0) return Fail(message, "there is no earlier view to zoom back to");
+            if (m_state->view.position == 0)
+                return Refuse(*m_state, message, Refusal::State, "there is no earlier view to zoom back to");
             v = m_state->view.history[m_state->view.position - 1];
         }
         if (Given(name)) {
             std::vector<std::string> names;
             if (!Resolve(name, names, message)) return 0;
             auto box = BoxOfAll(*d, names);
-            if (!box) return Fail(message, "'" + TextOf(name) + "' is not placed on the device");
+            if (!box)
+                return Refuse(*m_state, message, Refusal::Value, "'" + TextOf(name) + "' is not placed on the device");
             v = FromBox(*box);
         }
         std::vector<double> n;
@@ -148,14 +153,16 @@ public:
                         Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
         const Design* d = m_state->CurrentDesign();
-        if (d == nullptr) return Fail(message, kNoProject);
+        if (d == nullptr) return Refuse(*m_state, message, Refusal::NoProject, kNoProject);
         if ((left && right) || (up && down) || (top && bottom) || (farleft && farright))
-            return Fail(message, "pan cannot move both ways at once");
+            return Refuse(*m_state, message, Refusal::Value, "pan cannot move both ways at once");
         double percent = Setting("pan_percentage", 50.0);
         if (Given(percentage)) {
             std::vector<double> p;
             if (Numbers(percentage, 1, p) != Read::Numbers || p[0] <= 0 || p[0] > 1000)
-                return Fail(message, "-percentage expects a number above 0 and at most 1000, not '" + TextOf(percentage) + "'");
+                return Refuse(
+                    *m_state, message, Refusal::Value,
+                    "-percentage expects a number above 0 and at most 1000, not '" + TextOf(percentage) + "'");
             percent = p[0];
         }
         Viewport v = Shown();
@@ -177,7 +184,8 @@ public:
             std::vector<std::string> names;
             if (!Resolve(name, names, message)) return 0;
             auto box = BoxOfAll(*d, names);
-            if (!box) return Fail(message, "'" + TextOf(name) + "' is not placed on the device");
+            if (!box)
+                return Refuse(*m_state, message, Refusal::Value, "'" + TextOf(name) + "' is not placed on the device");
             v.x = (box->x0 + box->x1) / 2 - v.width / 2, v.y = (box->y0 + box->y1) / 2 - v.height / 2;
         }
         return Show(*d, v, result, message);
@@ -196,15 +204,18 @@ private:
     }
 
     // The numbers an option gives, or false with the failure said in `message`.
-    static bool Need(const Prop& p, std::size_t count, const char* option, const char* what, std::vector<double>& n,
-                     Msg& message) {
+    bool Need(const Prop& p, std::size_t count, const char* option, const char* what, std::vector<double>& n,
+              Msg& message) const {
+        const ToolState& state = *m_state;
         switch (Numbers(p, count, n)) {
             case Read::Numbers: return true;
-            case Read::NotNumbers: return Fail(message, std::string(option) + " expects " + what) != 0;
+            case Read::NotNumbers:
+                return Refuse(state, message, Refusal::Value, std::string(option) + " expects " + what) != 0;
             case Read::TooFar: break;
         }
-        return Fail(message, std::string(option) + " expects numbers from -" + std::to_string(std::lround(kFarthest)) +
-                                 " to " + std::to_string(std::lround(kFarthest)) + ", not '" + TextOf(p) + "'") != 0;
+        return Refuse(state, message, Refusal::Value,
+                      std::string(option) + " expects numbers from -" + std::to_string(std::lround(kFarthest)) +
+                          " to " + std::to_string(std::lround(kFarthest)) + ", not '" + TextOf(p) + "'") != 0;
     }
 
     double Setting(const char* name, double fallback) const { return m_state->settings.Number(name, fallback); }
@@ -241,10 +252,12 @@ private:
 
     CommonI::RESULT Step(int direction, Out& result, Msg& message) {
         if (!Alive(*m_state, message)) return 0;
-        if (m_state->CurrentDesign() == nullptr) return Fail(message, kNoProject);
+        if (m_state->CurrentDesign() == nullptr) return Refuse(*m_state, message, Refusal::NoProject, kNoProject);
         ViewState& view = m_state->view;
-        if (direction < 0 && view.position == 0) return Fail(message, "there is no previous view");
-        if (direction > 0 && view.position + 1 >= view.history.size()) return Fail(message, "there is no next view");
+        if (direction < 0 && view.position == 0)
+            return Refuse(*m_state, message, Refusal::State, "there is no previous view");
+        if (direction > 0 && view.position + 1 >= view.history.size())
+            return Refuse(*m_state, message, Refusal::State, "there is no next view");
         view.position = direction < 0 ? view.position - 1 : view.position + 1;
         return Answer(Value(view.history[view.position]), result, message);
     }

@@ -45,6 +45,7 @@ listing() { (cd "$stage" && find . ! -type d | sed 's|^\.||' | general); }
         echo "$prefix/lib/tcltk/kelmar$version/lib$f.so"
     done
     echo "$prefix/lib/tcltk/kelmar$version/pkgIndex.tcl"
+    echo "$prefix/lib/tcltk/kelmar$version/kelmartool_report.tcl"
 } | sort > "$work/expected"
 listing | diff "$work/expected" - || fail "the installed files differ from the expected ones (< expected, > installed)"
 general < "$work/manifest" | diff "$work/expected" - || fail "the manifest lists other files"
