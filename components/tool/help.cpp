@@ -1,10 +1,8 @@
-// Usage texts of every command word of every interface, offered through ICommandHelp. The words of
-// a wrapper's own names for an operation (new_, delete_, export_, sizeof_) lead to the same text.
-// A text is the call, a colon, what the command does and last what it gives back:
+// Usage texts of every command word of every interface, offered through the kit's ICommandHelp.
+// The words of a wrapper's own names for an operation (new_, delete_, export_, sizeof_) lead to the
+// same text. A text is the call, a colon, what the command does and last what it gives back:
 // "CALL: DOES; returns WHAT", or "CALL: returns WHAT" for a question. The call holds no colon.
 #include <cstring>
-#include <string>
-#include <string_view>
 
 #include "component.h"
 
@@ -12,16 +10,11 @@ namespace kelmartool {
 
 namespace {
 
-struct Usage {
-    const char* word;
-    const char* text;
-};
+using TcltaskKit::Usage;
 
 struct InterfaceHelp {
     const char* name;
-    const char* summary;
-    const Usage* usages;
-    std::size_t count;
+    TcltaskKit::HelpTable table;
 };
 
 constexpr Usage kProject[] = {
@@ -171,63 +164,28 @@ constexpr Usage kFloorplan[] = {
     {"refresh", "floorplan refresh: recomputes the floorplan view; returns the view as a dict of x0, y0, x1, y1, region and blocks"},
 };
 
-template <std::size_t N>
-constexpr InterfaceHelp Entry(const char* name, const char* summary, const Usage (&usages)[N]) {
-    return {name, summary, usages, N};
-}
-
 constexpr InterfaceHelp kHelp[] = {
-    Entry("ITclProject", "a project of the tool: one design file", kProject),
-    Entry("ITclProjectMgr", "the project manager: opens and closes projects", kProjectMgr),
-    Entry("ICollection", "named collections of design objects", kCollection),
-    Entry("IGlobal", "typed global settings of the tool", kGlobal),
-    Entry("IObject", "questions about single design objects", kObject),
-    Entry("IGraphicalView", "the viewport over the device, with its history", kView),
-    Entry("IHighlight", "coloured highlighting of design objects", kHighlight),
-    Entry("ISelection", "the set of selected design objects", kSelection),
-    Entry("ISearch", "search of design objects by name", kSearch),
-    Entry("ITimingAnalysis", "named static timing analyses of the design", kTiming),
-    Entry("IXFloorplan", "the floorplan: blocks, regions, prohibited sites and analyses", kFloorplan),
+    {"ITclProject", {"a project of the tool: one design file", kProject}},
+    {"ITclProjectMgr", {"the project manager: opens and closes projects", kProjectMgr}},
+    {"ICollection", {"named collections of design objects", kCollection}},
+    {"IGlobal", {"typed global settings of the tool", kGlobal}},
+    {"IObject", {"questions about single design objects", kObject}},
+    {"IGraphicalView", {"the viewport over the device, with its history", kView}},
+    {"IHighlight", {"coloured highlighting of design objects", kHighlight}},
+    {"ISelection", {"the set of selected design objects", kSelection}},
+    {"ISearch", {"search of design objects by name", kSearch}},
+    {"ITimingAnalysis", {"named static timing analyses of the design", kTiming}},
+    {"IXFloorplan", {"the floorplan: blocks, regions, prohibited sites and analyses", kFloorplan}},
 };
 
-class CommandHelp final : public ICommandHelp {
-public:
-    explicit CommandHelp(const InterfaceHelp* help) : m_counter(this), m_help(help) {}
-
-    CitI::IInterface* GetInterface(const Port::XUID& id) override {
-        if (id == ICommandHelpID || id == CitI::IInterfaceID) return this;
-        if (id == CommonI::IRefCountID) return &m_counter;
-        return nullptr;
-    }
-    Port_String GetSummary() override { return m_help ? m_help->summary : ""; }
-    Port_String GetTopics() override {
-        std::string topics;
-        for (std::size_t i = 0; m_help && i < m_help->count; ++i) {
-            const std::string_view word = m_help->usages[i].word;
-            if (word.ends_with('_')) continue;  // operation names are aliases, not topics
-            if (!topics.empty()) topics += ' ';
-            topics += word;
-        }
-        return topics.c_str();
-    }
-    Port_String GetHelp(const Port_String& word) override {
-        for (std::size_t i = 0; m_help && i < m_help->count; ++i)
-            if (std::strcmp(m_help->usages[i].word, word.c_str()) == 0) return Port_String("Usage: ", m_help->usages[i].text);
-        return Port_String("No help for '", word.c_str(), "'");
-    }
-
-private:
-    CommonI::RefCounter m_counter;
-    const InterfaceHelp* m_help;
-};
+constexpr TcltaskKit::HelpTable kNoHelp{"", {}};
 
 }  // namespace
 
-ICommandHelp* NewCommandHelp(const char* interfaceName) {
-    const InterfaceHelp* found = nullptr;
+const TcltaskKit::HelpTable& HelpOf(const char* interfaceName) {
     for (const InterfaceHelp& h : kHelp)
-        if (std::strcmp(h.name, interfaceName) == 0) found = &h;
-    return new CommandHelp(found);
+        if (std::strcmp(h.name, interfaceName) == 0) return h.table;
+    return kNoHelp;
 }
 
 }  // namespace kelmartool

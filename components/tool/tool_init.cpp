@@ -13,9 +13,6 @@
 #include <string_view>
 #include <vector>
 
-#include "CitI/IScriptHandle.h"
-#include "Port/Init.h"
-#include "Script/TclWrapFactory.h"
 #include "TcltaskI/ICollection.h"
 #include "TcltaskI/IGlobal.h"
 #include "TcltaskI/IGraphicalView.h"
@@ -26,16 +23,15 @@
 #include "TcltaskI/ITclProjectMgr.h"
 #include "TcltaskI/ITimingAnalysis.h"
 #include "TcltaskI/IXFloorplan.h"
+#include "TcltaskKit/Module.h"
+#include "TcltaskKit/Publish.h"
 #include "project.h"
 #include "roots.h"
 
 namespace {
 
 // This module uses the portability layer, so it holds it up like every other module.
-Port::FileInit s_fileInit;
-Port::PathListInit s_pathListInit;
-CitP::InstanceTableInit s_instanceTableInit;
-CitP::FactoryInit s_factoryInit;
+TcltaskKit::ModuleInit s_portLayer;
 
 constexpr const char* kStateKey = "kelmartool";
 
@@ -90,14 +86,11 @@ Tcl_Obj* RootWord(Tcl_Interp* interp, const char* root) {
     return static_cast<const RootTarget*>(info.objClientData)->word;
 }
 
-// Hands `object` to Tcl under its interface and makes ::kelmartool::`root` the root command of the
-// wrapper's word. The wrapper takes its own reference; the one held here goes at the end.
+// Hands a new object to Tcl under its interface and makes ::kelmartool::`root` the root command of
+// the wrapper's word; an object that cannot be handed over ends here.
 bool Publish(Tcl_Interp* interp, const char* root, const Port::XUID& id, CitI::IInterface* made) {
-    CitI::MIInterface object(made);
-    CitI::IInterface* wrapped = Script::TclWrapFactory::CreateInstance(id, object.get(), interp);
-    auto* handle = wrapped ? static_cast<CitI::IScriptHandle*>(wrapped->GetInterface(CitI::IScriptHandleID)) : nullptr;
-    if (handle == nullptr || !handle->SetResult(interp)) {
-        Tcl_SetObjResult(interp, Tcl_ObjPrintf("cannot hand the %s object to Tcl: is TcltaskI_Morvane loaded?", root));
+    if (!TcltaskKit::HandToTcl(interp, id, made)) {
+        Tcl_SetObjResult(interp, Tcl_ObjPrintf("cannot hand the %s object to Tcl: %s", root, Tcl_GetStringResult(interp)));
         return false;
     }
     Tcl_Obj* word = Tcl_DuplicateObj(Tcl_GetObjResult(interp));
