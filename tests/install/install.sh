@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # make install into a temporary DESTDIR: the files and where they go, that the staged tree works
-# (tclsh, kelmarsh, a C++ program through the CMake package and through pkg-config), and that the
-# uninstall leaves nothing behind.
+# (tclsh, kelmarsh, a C++ program through the CMake package and through pkg-config, the
+# implementer's example module loaded by tclsh), and that the uninstall leaves nothing behind.
 #   install.sh BUILD_DIR VERSION
 set -euo pipefail
 build=$(cd "$1" && pwd)
@@ -82,6 +82,21 @@ same "probe built with find_package(Kelmar)" "$("$work/probe/probe")" "$want"
 g++ -std=c++20 -Wall -Wextra -Werror "$here/probe.cpp" -o "$work/probe-pc" \
     $(PKG_CONFIG_PATH=$root/lib/pkgconfig pkg-config --cflags --libs "kelmar = $version")
 same "probe built with pkg-config" "$("$work/probe-pc")" "$want"
+
+# The implementer's example module, built as the guide says against the installed headers and
+# libraries, loaded by a stock tclsh that finds the package in the staged tree.
+# shellcheck disable=SC2046  # the flags are words
+g++ -std=c++20 -Wall -Wextra -Werror -shared -fPIC -fvisibility=hidden -DUSE_TCL_STUBS -I/usr/include/tcl8.6 \
+    "$source_dir/examples/map_collection/map_collection.cpp" -o "$work/libmapcollection.so" \
+    $(PKG_CONFIG_PATH=$root/lib/pkgconfig pkg-config --cflags --libs "kelmar = $version") -ltclstub8.6
+cat > "$work/module.tcl" <<'EOF'
+load [lindex $argv 0] Mapcollection
+set c [mapcollection]
+$c set nets {a b c}
+puts [list [$c append_to nets d a -unique] [$c sizeof [$c get nets]] [package present TcltaskI_Morvane]]
+EOF
+same "the example module" "$(TCLLIBPATH=$root/lib/tcltk tclsh8.6 "$work/module.tcl" "$work/libmapcollection.so")" \
+    "{a b c d} 4 $version"
 
 # Uninstall, as make uninstall does, from the manifest of this install.
 DESTDIR=$stage cmake -DMANIFEST="$work/manifest" -P "$build/uninstall.cmake" > "$work/uninstall.log"
