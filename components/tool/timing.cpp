@@ -289,6 +289,7 @@ public:
                 a.result = std::move(previous);
                 return 0;
             }
+            Data(state).lastRun = a.id;
             return 1;
         });
     }

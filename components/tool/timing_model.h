@@ -97,6 +97,7 @@ struct Analysis {
 
 struct TimingData {
     std::map<std::string, Analysis> analyses;
+    std::string lastRun;  // the analysis run last, whose worst path the view draws
 };
 
 // Computes the result of `settings` over `design`. `pathLimit` applies when the paths query sets no

@@ -27,6 +27,7 @@
 #include "TcltaskKit/Publish.h"
 #include "project.h"
 #include "roots.h"
+#include "scene/scene_commands.h"
 
 namespace {
 
@@ -274,5 +275,6 @@ extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp
     Tcl_CreateObjCommand(interp, "::kelmartool::open", OpenCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::help", HelpCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::object", ObjectCommand, nullptr, nullptr);
+    kelmartool::CreateSceneCommands(interp);
     return Tcl_PkgProvide(interp, "KelmarTool", KELMAR_VERSION);
 }
