@@ -202,15 +202,15 @@ private:
         return text;
     }
 
+    // Blocks are no objects a script highlights or selects: they are outlined alone.
     void Blocks() {
         const std::vector<Block>& blocks = m_plan ? m_plan->constraints.blocks : m_design.blocks;
         for (const Block& block : blocks) {
             const std::optional<Region> region = RegionOf(block);
             if (!region || !Meets(region->x0, region->y0, region->x1 + 1, region->y1 + 1)) continue;
-            const std::string* colour = Highlight(block.name);
             Add(SceneKind::Block, block.name,
-                {double(region->x0), double(region->y0), double(region->x1 + 1), double(region->y1 + 1)},
-                colour ? *colour : "", Outline(block.name, "#2060c0"), block.name, kLayerBlock);
+                {double(region->x0), double(region->y0), double(region->x1 + 1), double(region->y1 + 1)}, "",
+                "#2060c0", block.name, kLayerBlock);
         }
     }
 
