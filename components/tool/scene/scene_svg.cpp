@@ -89,14 +89,21 @@ public:
         out += "<rect " + head + " x=\"" + Number(px0) + "\" y=\"" + Number(py0) + "\" width=\"" + Number(px1 - px0) +
                "\" height=\"" + Number(py1 - py0) + "\" fill=\"" + (item.fill.empty() ? "none" : Escape(item.fill)) +
                "\" stroke=\"" + stroke + "\" stroke-width=\"" + (selected ? "3" : "1") + "\">" + title + "</rect>\n";
+        if (item.kind == SceneKind::Prohibited)
+            out += "<path d=\"M" + Number(px0) + " " + Number(py0) + "L" + Number(px1) + " " + Number(py1) + "M" +
+                   Number(px0) + " " + Number(py1) + "L" + Number(px1) + " " + Number(py0) + "\" stroke=\"" + stroke +
+                   "\"/>\n";
         if (item.label.empty() || item.kind == SceneKind::Device) return;
-        // A label goes where it fits: inside a small item, along the top edge of a region.
+        // A label goes where it fits: inside a small item, inside the top of a bank, and above a
+        // block, whose inside its cells fill.
         const double wide = double(item.label.size()) * kFontPx * 0.6;
-        if (px1 - px0 < wide + 2 || py1 - py0 < kFontPx + 2) return;
-        const bool region = item.kind == SceneKind::Block || item.kind == SceneKind::Bank;
-        const double ty = region ? py0 + kFontPx + 1 : (py0 + py1) / 2 + kFontPx / 3;
+        const bool block = item.kind == SceneKind::Block;
+        if (px1 - px0 < wide + 2 || (!block && py1 - py0 < kFontPx + 2)) return;
+        const double ty = block                          ? py0 - 3
+                          : item.kind == SceneKind::Bank ? py0 + kFontPx + 1
+                                                         : (py0 + py1) / 2 + kFontPx / 3;
         out += "<text x=\"" + Number((px0 + px1) / 2) + "\" y=\"" + Number(ty) + "\" font-size=\"" + Number(kFontPx) +
-               "\" text-anchor=\"middle\" fill=\"#202020\">" + Escape(item.label) + "</text>\n";
+               "\" text-anchor=\"middle\" fill=\"" + (block ? "#2060c0" : "#202020") + "\">" + Escape(item.label) + "</text>\n";
     }
 
 private:
