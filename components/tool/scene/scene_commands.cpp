@@ -124,6 +124,9 @@ int SnapshotCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const obj
             size[index] = px;
         }
         const Viewport rect = ShownRect(*state);
+        // The view interface keeps at least one site a side; a rectangle with no area has no scale.
+        if (!(rect.width > 0 && rect.height > 0 && std::isfinite(rect.width) && std::isfinite(rect.height)))
+            return Refused(interp, *state, Refusal::State, "the view shows no area to draw");
         auto follow = [](double px) { return static_cast<int>(std::clamp(std::lround(px), 1L, long(kMaxPixels))); };
         if (size[0] == 0 && size[1] == 0) size[0] = kDefaultWidth;
         if (size[0] == 0) size[0] = follow(size[1] * rect.width / rect.height);
