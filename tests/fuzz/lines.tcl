@@ -321,7 +321,7 @@ set fz::classes {
     kit 40 kitLine  tool 30 toolLine  design 4 designLine  close 2 closeLine  make 3 makeLine
     rename 2 renameLine  delete 2 deleteLine  namespace 1 namespaceLine  trace 1 traceLine
     highlight 1 highlightLine  child 1 childLine  childcall 2 childCallLine  register 2 registerLine
-    wrap 2 wrapLine  fault 1 faultLine
+    wrap 2 wrapLine  fault 1 faultLine  scene 2 sceneLine
 }
 
 proc fz::kitLine {} {
@@ -346,6 +346,14 @@ proc fz::designLine {} {
         "projmgr OpenWithHelper [q $file] [word] msg" \
         "file copy -force [q $file] \[project GetFileName\]; project Reload msg" "projmgr ReloadCurrent msg" \
         "project Sync msg" "projmgr SyncCurrent msg"]
+}
+# The view's scene and its picture, over the view or a rectangle of numbers, into the lines' files.
+proc fz::sceneLine {} {
+    set rect "\[list [word number] [word number] [word number] [word number]\]"
+    pick [list "kelmartool::scene" "kelmartool::scene -rect $rect" "kelmartool::scene [word option] [word]" \
+        "kelmartool::scene -rect [word]" "kelmartool::snapshot [word file]" \
+        "kelmartool::snapshot [word file] -width [word number] -height [word number]" \
+        "kelmartool::snapshot [word file] [words 3]"]
 }
 proc fz::closeLine {} {
     pick [list {projmgr CloseCurrent msg} {projmgr Close [project GetFileName] msg} {project Close} \
