@@ -129,14 +129,22 @@ private:
                     Fill(b.name, "#f4efe0"), Outline(b.name, "#c0a060"), b.name, kLayerBank);
     }
 
+    // Prohibited sites beyond the detail limit become bins too, grey, labelled with their count.
     void Prohibited() {
         const std::set<std::string>& sites = m_plan ? m_plan->constraints.prohibited : m_design.prohibited;
+        std::map<SiteRef, std::size_t> shown;
         for (const std::string& name : sites) {
             int x = 0, y = 0;
-            if (!ParseSiteName(name, x, y) || !SiteMeets({x, y})) continue;
-            Add(SceneKind::Prohibited, name, {double(x), double(y), double(x + 1), double(y + 1)}, "#b8b8b8",
-                "#707070", "", kLayerProhibited);
+            if (ParseSiteName(name, x, y) && m_design.device.OnDevice(x, y) && SiteMeets({x, y})) shown.emplace(SiteRef{x, y}, 1);
         }
+        if (shown.size() > kDetailCellLimit) {
+            Bins(shown, SceneKind::Prohibited, "prohibited", 1.0, "#707070", kLayerProhibited,
+                 [](double) { return std::string("#b8b8b8"); });
+            return;
+        }
+        for (const auto& [site, count] : shown)
+            Add(SceneKind::Prohibited, Device::SiteName(site), {double(site.x), double(site.y), double(site.x + 1),
+                double(site.y + 1)}, "#b8b8b8", "#707070", "", kLayerProhibited);
     }
 
     void Cells() {
@@ -150,7 +158,11 @@ private:
             ++m_scene.cellsInView;
         }
         if (m_scene.cellsInView > kDetailCellLimit) {
-            Density(bySite);
+            m_scene.density = true;
+            std::map<SiteRef, std::size_t> counts;
+            for (const auto& [site, cells] : bySite) counts.emplace(site, cells.size());
+            Bins(counts, SceneKind::Density, "density", double(std::max(1, m_design.device.siteCapacity)), "",
+                 kLayerCell, Shade);
             return;
         }
         for (const auto& [site, cells] : bySite) {
@@ -164,10 +176,12 @@ private:
         }
     }
 
-    // Bins of whole sites over the rectangle, at most kDensityBins a side; a bin's shade is its cells
-    // over the cells its sites can hold.
-    void Density(const std::map<SiteRef, std::vector<const Cell*>>& bySite) {
-        m_scene.density = true;
+    // Bins of whole sites over the rectangle, at most kDensityBins a side, each an item of `kind`
+    // named prefix.<column>.<row> and labelled with its count, filled by `fill` from the count over
+    // the count the bin's sites can hold at `perSite` each.
+    template <class Fill>
+    void Bins(const std::map<SiteRef, std::size_t>& counts, SceneKind kind, const char* prefix, double perSite,
+              const char* outline, int layer, Fill fill) {
         const kelmartool::Device& d = m_design.device;
         const int sx0 = std::max(0, int(std::floor(m_rect.x))), sy0 = std::max(0, int(std::floor(m_rect.y)));
         const int sx1 = std::min(d.columns, int(std::ceil(m_rect.x + m_rect.width)));
@@ -175,21 +189,21 @@ private:
         const int stepX = std::max(1, (sx1 - sx0 + kDensityBins - 1) / kDensityBins);
         const int stepY = std::max(1, (sy1 - sy0 + kDensityBins - 1) / kDensityBins);
         const int binsX = (sx1 - sx0 + stepX - 1) / stepX, binsY = (sy1 - sy0 + stepY - 1) / stepY;
-        std::vector<std::size_t> counts(std::size_t(binsX) * std::size_t(binsY), 0);
-        for (const auto& [site, cells] : bySite) {
+        std::vector<std::size_t> bins(std::size_t(binsX) * std::size_t(binsY), 0);
+        for (const auto& [site, count] : counts) {
             const int bx = (site.x - sx0) / stepX, by = (site.y - sy0) / stepY;
-            counts[std::size_t(by) * std::size_t(binsX) + std::size_t(bx)] += cells.size();
+            bins[std::size_t(by) * std::size_t(binsX) + std::size_t(bx)] += count;
         }
         for (int by = 0; by < binsY; ++by)
             for (int bx = 0; bx < binsX; ++bx) {
-                const std::size_t count = counts[std::size_t(by) * std::size_t(binsX) + std::size_t(bx)];
+                const std::size_t count = bins[std::size_t(by) * std::size_t(binsX) + std::size_t(bx)];
                 if (count == 0) continue;
                 const int x0 = sx0 + bx * stepX, y0 = sy0 + by * stepY;
                 const int x1 = std::min(sx1, x0 + stepX), y1 = std::min(sy1, y0 + stepY);
-                const double room = double(x1 - x0) * double(y1 - y0) * double(std::max(1, d.siteCapacity));
-                Add(SceneKind::Density, "density." + std::to_string(bx) + "." + std::to_string(by),
-                    {double(x0), double(y0), double(x1), double(y1)}, Shade(double(count) / room), "",
-                    std::to_string(count), kLayerCell);
+                const double room = double(x1 - x0) * double(y1 - y0) * perSite;
+                Add(kind, std::string(prefix) + "." + std::to_string(bx) + "." + std::to_string(by),
+                    {double(x0), double(y0), double(x1), double(y1)}, fill(double(count) / room), outline,
+                    std::to_string(count), layer);
             }
     }
 
