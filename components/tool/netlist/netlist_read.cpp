@@ -135,6 +135,8 @@ double SetupOf(TypeInfo::Class kind) { return kind == TypeInfo::Ram ? 0.3 : kind
 
 // Nodes 0, 1 and 2 are the constants 0, 1 and x (z is read as x); every other node is a bit.
 constexpr int kConstants = 3;
+// Instances nested deeper than this are refused before the recursion could exhaust the stack.
+constexpr std::size_t kMaxDepth = 1000;
 constexpr const char* kConstantWords[kConstants] = {"0", "1", "x"};
 
 class Importer {
@@ -260,6 +262,11 @@ private:
             for (const std::string& m : stack) chain += m + " -> ";
             throw Refused{"module '" + name + "' instantiates itself: " + chain + name};
         }
+        if (stack.size() >= kMaxDepth)
+            throw Refused{"module '" + name + "' lies deeper than " + std::to_string(kMaxDepth) + " levels of instances"};
+        // An instance costs work even with no cell in it: a hierarchy that multiplies them is refused.
+        if (++m_instances > static_cast<std::size_t>(kMaxCount))
+            throw Refused{"the netlist has more than " + std::to_string(kMaxCount) + " module instances"};
         stack.push_back(name);
         const std::string path = "netlist.modules." + name;
         const json& module = m_modules->at(name);
@@ -501,6 +508,7 @@ private:
     std::vector<RawPort> m_ports;
     std::vector<RawCell> m_cells;
     std::set<std::string> m_taken;
+    std::size_t m_instances = 0;
     std::unique_ptr<Design> m_design;
 };
 
