@@ -135,8 +135,9 @@ double SetupOf(TypeInfo::Class kind) { return kind == TypeInfo::Ram ? 0.3 : kind
 
 // Nodes 0, 1 and 2 are the constants 0, 1 and x (z is read as x); every other node is a bit.
 constexpr int kConstants = 3;
-// Instances nested deeper than this are refused before the recursion could exhaust the stack.
-constexpr std::size_t kMaxDepth = 1000;
+// Instances nested deeper than this are refused before the recursion could exhaust the stack (a
+// frame of the flattening takes kilobytes under the sanitizers); real hierarchies are a few dozen deep.
+constexpr std::size_t kMaxDepth = 100;
 constexpr const char* kConstantWords[kConstants] = {"0", "1", "x"};
 
 class Importer {
