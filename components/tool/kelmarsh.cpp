@@ -1,6 +1,6 @@
 // kelmarsh: the tool's Tcl shell.
 //
-//   kelmarsh ?-project FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
+//   kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
 //
 // Loads the tool package from the lib folder beside the shell's own binary, imports its root
 // commands and makes `help`, opens FILE as the current project when given, then runs the script,
@@ -57,11 +57,21 @@ void AddPackageDirs(Tcl_Interp* interp) {
     Tcl_ResetResult(interp);
 }
 
+// Opens the -project file, or imports the -netlist into it (or beside the netlist).
 void OpenProject(Tcl_Interp* interp) {
-    if (g_commandLine.project.empty()) return;
-    Tcl_Obj* command[] = {Tcl_NewStringObj("::kelmartool::open", -1),
-                          Tcl_NewStringObj(g_commandLine.project.c_str(), -1)};
-    Tcl_Obj* line = Tcl_NewListObj(2, command);
+    const std::string& project = g_commandLine.project;
+    const std::string& netlist = g_commandLine.netlist;
+    if (project.empty() && netlist.empty()) return;
+    Tcl_Obj* line = Tcl_NewListObj(0, nullptr);
+    const auto add = [line](const std::string& word) {
+        Tcl_ListObjAppendElement(nullptr, line, Tcl_NewStringObj(word.c_str(), static_cast<int>(word.size())));
+    };
+    if (netlist.empty()) {
+        add("::kelmartool::open"), add(project);
+    } else {
+        add("::kelmartool::read_netlist"), add(netlist);
+        if (!project.empty()) add("-project"), add(project);
+    }
     Tcl_IncrRefCount(line);
     const int code = Tcl_EvalObjEx(interp, line, 0);
     Tcl_DecrRefCount(line);
@@ -70,6 +80,7 @@ void OpenProject(Tcl_Interp* interp) {
         Tcl_Exit(1);
     }
     g_openMessage = Tcl_GetStringResult(interp);
+    if (!netlist.empty()) g_openMessage = "imported " + netlist + " into " + g_openMessage;
     Tcl_ResetResult(interp);
 }
 

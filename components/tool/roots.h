@@ -15,6 +15,9 @@ CitI::IInterface* NewHighlight(const StatePtr& state);
 CitI::IInterface* NewSelection(const StatePtr& state);
 CitI::IInterface* NewSearch(const StatePtr& state);
 
+// kelmartool::read_netlist (read_netlist.cpp).
+int ReadNetlistCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]);
+
 // Settings tables answer alike wherever they are kept: a dict of name and value, or with
 // descriptors a list of dicts with name, type, description and value.
 Tcl_Obj* SettingsValue(const SettingTable& table, bool descriptors);

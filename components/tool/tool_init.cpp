@@ -276,5 +276,6 @@ extern "C" __attribute__((visibility("default"))) int Kelmartool_Init(Tcl_Interp
     Tcl_CreateObjCommand(interp, "::kelmartool::help", HelpCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::object", ObjectCommand, nullptr, nullptr);
     kelmartool::CreateSceneCommands(interp);
+    Tcl_CreateObjCommand(interp, "::kelmartool::read_netlist", kelmartool::ReadNetlistCommand, nullptr, nullptr);
     return Tcl_PkgProvide(interp, "KelmarTool", KELMAR_VERSION);
 }

@@ -14,11 +14,13 @@ CommandLine Refused(std::string why) {
 }
 
 constexpr const char kSynopsis[] =
-    "usage: kelmarsh ?-project FILE? ?-norc? ?--? ?script.tcl? ?arg ...?\n"
+    "usage: kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?--? ?script.tcl? ?arg ...?\n"
     "       kelmarsh -h | --help | --version\n";
 
 constexpr const char kDetails[] =
     "  -project FILE  open the design FILE as the current project first\n"
+    "  -netlist FILE  import the synthesized JSON netlist FILE first (kelmartool::read_netlist),\n"
+    "                 into the project file of -project when given\n"
     "  -norc          do not read ~/.kelmarshrc at the interactive prompt\n"
     "  --             the next word is the script, even if it begins with -\n"
     "  -h, --help     print this text and exit\n"
@@ -50,6 +52,11 @@ CommandLine ParseCommandLine(int argc, const char* const argv[]) {
             if (!line.project.empty()) return Refused("-project given twice");
             line.project = argv[++i];
             if (line.project.empty()) return Refused("-project needs a design file");
+        } else if (word == "-netlist") {
+            if (i + 1 >= argc) return Refused("-netlist needs a netlist file");
+            if (!line.netlist.empty()) return Refused("-netlist given twice");
+            line.netlist = argv[++i];
+            if (line.netlist.empty()) return Refused("-netlist needs a netlist file");
         } else if (word == "-norc") {
             line.readStartupFile = false;
         } else if (word == "--") {

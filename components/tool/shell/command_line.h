@@ -1,6 +1,6 @@
 // The command line of kelmarsh:
 //
-//   kelmarsh ?-project FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
+//   kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
 //   kelmarsh -h | --help | --version
 //
 // The options may stand in any order before the script; the first word that is not an option is the
@@ -17,6 +17,7 @@ struct CommandLine {
     Action action = Action::Run;
     std::string error;                 // why the line was refused, for Action::Error
     std::string project;               // empty: no project opened at start
+    std::string netlist;               // imported at start, into `project` when that is given
     bool readStartupFile = true;       // -norc turns ~/.kelmarshrc off
     bool hasScript = false;
     std::string script;

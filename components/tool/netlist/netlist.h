@@ -1,0 +1,36 @@
+// Netlist import: the JSON netlist a synthesis tool writes (`write_json`: modules with ports, cells
+// and netnames over numbered bits) turned into a placed design of the tool's model. Plain C++ over
+// the model, no Tcl.
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "design.h"
+
+namespace kelmartool {
+
+struct NetlistOptions {
+    std::string top;                       // the top module; empty: the one marked "top"
+    std::map<std::string, double> clocks;  // net or port name -> period in ns
+    int columns = 0, rows = 0;             // the device; 0: sized to the design
+    std::uint64_t seed = 1;
+};
+
+// The period of a clock found on the flip-flops' clock pins that no option names.
+inline constexpr double kDefaultClockPeriod = 10.0;
+
+// Reads `text`, the content of `file`, into a placed design. Null with `error` saying where and why
+// (the file, the path in the JSON, the reason) when the netlist cannot be imported.
+std::unique_ptr<Design> ImportNetlist(const std::string& file, const std::string& text, const NetlistOptions& options,
+                                      std::string& error);
+
+// Places the ports of `design` on the edge of its device and its cells on the logic sites inside,
+// one a site, in the order of their distance from the inputs; `seed` orders the cells of one level.
+// The device is sized to the design unless `columns` and `rows` are given. Empty on success, else why.
+std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t seed);
+
+}  // namespace kelmartool
