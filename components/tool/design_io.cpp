@@ -24,6 +24,7 @@
 #include "design.h"
 #include "file_io.h"
 #include "json_edit.h"
+#include "json_shown.h"
 
 namespace kelmartool {
 
@@ -36,13 +37,6 @@ struct BadField {
     std::string text;
 };
 
-// A value as a message shows it: its JSON text, cut short when it is long.
-std::string Shown(const ordered_json& value) {
-    std::string text = value.dump(-1, ' ', false, ordered_json::error_handler_t::replace);
-    constexpr std::size_t kLongest = 60;
-    if (text.size() > kLongest) text = text.substr(0, kLongest) + "...";
-    return text;
-}
 
 class Reader {
 public:

@@ -19,6 +19,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include "json_shown.h"
 #include "netlist.h"
 
 namespace kelmartool {
@@ -32,12 +33,6 @@ struct Refused {
     std::string text;
 };
 
-std::string Shown(const json& value) {
-    std::string text = value.dump(-1, ' ', false, json::error_handler_t::replace);
-    constexpr std::size_t kLongest = 60;
-    if (text.size() > kLongest) text = text.substr(0, kLongest) + "...";
-    return text;
-}
 
 // A member that must be an object; an absent one reads as empty when `required` is false.
 const json& Object(const json& node, const char* key, const std::string& path, bool required) {
