@@ -1,11 +1,16 @@
 // kelmarsh: the tool's Tcl shell.
 //
-//   kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
+//   kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?-gui? ?--? ?script.tcl? ?arg ...?
 //
 // Loads the tool package from the lib folder beside the shell's own binary, imports its root
 // commands and makes `help`, opens FILE as the current project when given, then runs the script,
 // or reads commands: at a terminal with line editing, history and completion (shell/), otherwise as
 // tclsh reads them.
+//
+// With -gui the shell loads Tk and opens the view's window before the script or the commands. Tk
+// gives Tcl_Main its event loop, so commands are read from the input by a file handler between the
+// window's events (as wish reads them), without the shell's line editing, whose reader would block
+// the window. A script runs first; the window then stays, with commands read, until the input ends.
 #include <tcl.h>
 #include <unistd.h>
 
@@ -38,7 +43,18 @@ void RunScript(Tcl_Interp* interp) {
         ReportScriptError(interp);
         Tcl_Exit(1);
     }
-    Tcl_Exit(0);
+    if (!g_commandLine.gui) Tcl_Exit(0);
+    Tcl_SetStartupScript(nullptr, nullptr);  // Tcl_Main goes on to the event loop, not to the script again
+}
+
+// -gui: Tk, the main window withdrawn, and the view's window.
+void OpenWindow(Tcl_Interp* interp) {
+    if (!g_commandLine.gui) return;
+    if (Tcl_Eval(interp, "::kelmartool::show; wm withdraw .") != TCL_OK) {
+        std::fprintf(stderr, "kelmarsh: -gui: %s\n", Tcl_GetStringResult(interp));
+        Tcl_Exit(1);
+    }
+    Tcl_ResetResult(interp);
 }
 
 // The packages are looked for beside the binary itself, through every symbolic link to it, ahead of
@@ -87,7 +103,7 @@ void OpenProject(Tcl_Interp* interp) {
 // Without a script and with a terminal on the input, the shell's own prompt; it ends the process.
 // Commands piped in are left to Tcl_Main, which reads them as tclsh does.
 void RunPrompt(Tcl_Interp* interp) {
-    if (g_commandLine.hasScript || !isatty(0)) return;
+    if (g_commandLine.hasScript || g_commandLine.gui || !isatty(0)) return;
     kelmarsh::InteractiveSettings settings;
     if (!g_openMessage.empty()) settings.banner = "kelmarsh " KELMAR_VERSION ": " + g_openMessage;
     settings.readStartupFile = g_commandLine.readStartupFile;
@@ -120,6 +136,7 @@ int AppInit(Tcl_Interp* interp) {
         Tcl_Exit(1);
     }
     OpenProject(interp);
+    OpenWindow(interp);
     RunScript(interp);
     RunPrompt(interp);
     return TCL_OK;

@@ -46,6 +46,7 @@ listing() { (cd "$stage" && find . ! -type d | sed 's|^\.||' | general); }
     done
     echo "$prefix/lib/tcltk/kelmar$version/pkgIndex.tcl"
     echo "$prefix/lib/tcltk/kelmar$version/kelmartool_report.tcl"
+    echo "$prefix/lib/tcltk/kelmar$version/kelmartool_show.tcl"
 } | sort > "$work/expected"
 listing | diff "$work/expected" - || fail "the installed files differ from the expected ones (< expected, > installed)"
 general < "$work/manifest" | diff "$work/expected" - || fail "the manifest lists other files"

@@ -1,5 +1,6 @@
 // kelmartool::scene ?-rect {x0 y0 x1 y1}?: the scene as a list of dicts (kind, name, coords,
 // fill, outline, label, layer), of the view's rectangle unless -rect gives one.
+// kelmartool::shown: the view's rectangle as {x0 y0 x1 y1} in sites, the one scene and snapshot draw.
 // kelmartool::snapshot FILE ?-width PX? ?-height PX?: the view's rectangle written as SVG. With one
 // size given the other follows the rectangle's proportions; with none the picture is 800 pixels wide.
 #include "scene_commands.h"
@@ -99,6 +100,19 @@ int SceneCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]
     }
 }
 
+int ShownCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
+    if (objc != 1) {
+        Tcl_WrongNumArgs(interp, 1, objv, "");
+        return TCL_ERROR;
+    }
+    const StatePtr state = OpenState(interp);
+    if (!state) return TCL_ERROR;
+    const Viewport rect = ShownRect(*state);
+    Tcl_SetObjResult(interp, NewList({Tcl_NewDoubleObj(rect.x), Tcl_NewDoubleObj(rect.y),
+                                      Tcl_NewDoubleObj(rect.x + rect.width), Tcl_NewDoubleObj(rect.y + rect.height)}));
+    return TCL_OK;
+}
+
 int SnapshotCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
     if (objc < 2 || objc % 2 != 0) {
         Tcl_WrongNumArgs(interp, 1, objv, "file ?-width px? ?-height px?");
@@ -153,6 +167,7 @@ int SnapshotCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const obj
 
 void CreateSceneCommands(Tcl_Interp* interp) {
     Tcl_CreateObjCommand(interp, "::kelmartool::scene", SceneCommand, nullptr, nullptr);
+    Tcl_CreateObjCommand(interp, "::kelmartool::shown", ShownCommand, nullptr, nullptr);
     Tcl_CreateObjCommand(interp, "::kelmartool::snapshot", SnapshotCommand, nullptr, nullptr);
 }
 

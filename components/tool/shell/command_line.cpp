@@ -14,7 +14,7 @@ CommandLine Refused(std::string why) {
 }
 
 constexpr const char kSynopsis[] =
-    "usage: kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?--? ?script.tcl? ?arg ...?\n"
+    "usage: kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?-gui? ?--? ?script.tcl? ?arg ...?\n"
     "       kelmarsh -h | --help | --version\n";
 
 constexpr const char kDetails[] =
@@ -22,6 +22,8 @@ constexpr const char kDetails[] =
     "  -netlist FILE  import the synthesized JSON netlist FILE first (kelmartool::read_netlist),\n"
     "                 into the project file of -project when given\n"
     "  -norc          do not read ~/.kelmarshrc at the interactive prompt\n"
+    "  -gui           load Tk and open the view's window (kelmartool::show); commands are read\n"
+    "                 from the input between the window's events, without line editing\n"
     "  --             the next word is the script, even if it begins with -\n"
     "  -h, --help     print this text and exit\n"
     "  --version      print the version and exit\n"
@@ -57,6 +59,8 @@ CommandLine ParseCommandLine(int argc, const char* const argv[]) {
             if (!line.netlist.empty()) return Refused("-netlist given twice");
             line.netlist = argv[++i];
             if (line.netlist.empty()) return Refused("-netlist needs a netlist file");
+        } else if (word == "-gui") {
+            line.gui = true;
         } else if (word == "-norc") {
             line.readStartupFile = false;
         } else if (word == "--") {

@@ -1,6 +1,6 @@
 // The command line of kelmarsh:
 //
-//   kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?--? ?script.tcl? ?arg ...?
+//   kelmarsh ?-project FILE? ?-netlist FILE? ?-norc? ?-gui? ?--? ?script.tcl? ?arg ...?
 //   kelmarsh -h | --help | --version
 //
 // The options may stand in any order before the script; the first word that is not an option is the
@@ -19,6 +19,7 @@ struct CommandLine {
     std::string project;               // empty: no project opened at start
     std::string netlist;               // imported at start, into `project` when that is given
     bool readStartupFile = true;       // -norc turns ~/.kelmarshrc off
+    bool gui = false;                  // -gui: Tk and the view's window
     bool hasScript = false;
     std::string script;
     std::vector<std::string> scriptArgs;
