@@ -29,8 +29,15 @@ std::unique_ptr<Design> ImportNetlist(const std::string& file, const std::string
                                       std::string& error);
 
 // Places the ports of `design` on the edge of its device and its cells on the logic sites inside,
-// one a site, in the order of their distance from the inputs; `seed` orders the cells of one level.
+// one a site, in the order of their distance from the inputs, then anneals the cells (PlaceAnneal);
+// `seed` orders the cells of one level and seeds the annealing.
 // The device is sized to the design unless `columns` and `rows` are given. Empty on success, else why.
 std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t seed);
+
+// Moves the cells of a placed design over the logic sites of its device, by simulated annealing, to
+// a short total half-perimeter wire length; the ports stay. It starts from the cells shuffled over
+// the logic sites by `seed`, whose wire length is `start`; `placed` is the wire length it ends with.
+// The same seed gives the same placement. Empty on success, else why.
+std::string PlaceAnneal(Design& design, std::uint64_t seed, long long& start, long long& placed);
 
 }  // namespace kelmartool

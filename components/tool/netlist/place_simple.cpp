@@ -1,7 +1,7 @@
 // A first, legal placement of an imported design: ports on the edge of the device (inputs from the
 // west, outputs from the east), cells one a site on the logic sites inside, column by column in
-// the order a signal reaches them from the inputs. It minimises nothing; it gives every object a
-// site so that the design can be viewed, timed and floorplanned.
+// the order a signal reaches them from the inputs; then the cells are annealed to a short wire
+// length (place_anneal.cpp).
 #include <algorithm>
 #include <cmath>
 #include <deque>
@@ -136,8 +136,11 @@ std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t see
         design.cells[order[k]].site = Device::SiteName(1 + column, y);
     }
 
+    // Then the cells are annealed to a short wire length.
+    long long start = 0, placed = 0;
+    if (std::string problem = PlaceAnneal(design, seed, start, placed); !problem.empty()) return problem;
     if (std::string problem = design.Index(); !problem.empty()) return problem;
-    // Until the placement minimises it, a net's delay grows with the distance it spans.
+    // A net's delay grows with the distance it spans.
     long long wireLength = 0;
     for (Net& net : design.nets) {
         const int span = NetSpan(design, net);
@@ -145,6 +148,7 @@ std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t see
         net.delay = 0.1 + 0.05 * span;
     }
     design.properties["wire_length"] = std::to_string(wireLength);
+    design.properties["wire_length_start"] = std::to_string(start);
     return {};
 }
 
