@@ -9,6 +9,7 @@
 #include <unordered_map>
 
 #include "netlist.h"
+#include "seeded_random.h"
 
 namespace kelmartool {
 
@@ -21,14 +22,6 @@ constexpr std::size_t kMaxAnnealPins = 64;
 constexpr long long kMovesPerCell = 8;
 constexpr int kMaxTemperatures = 150;
 
-// splitmix64: the same sequence on every platform for a seed.
-std::uint64_t NextRandom(std::uint64_t& state) {
-    std::uint64_t z = (state += 0x9E3779B97F4A7C15ull);
-    z = (z ^ (z >> 30)) * 0xBF58476D1CE4E5B9ull;
-    z = (z ^ (z >> 27)) * 0x94D049BB133111EBull;
-    return z ^ (z >> 31);
-}
-double NextUnit(std::uint64_t& state) { return static_cast<double>(NextRandom(state) >> 11) * 0x1.0p-53; }
 
 class Annealer {
 public:

@@ -8,6 +8,7 @@
 #include <limits>
 
 #include "netlist.h"
+#include "seeded_random.h"
 
 namespace kelmartool {
 
@@ -16,13 +17,6 @@ namespace {
 // The share of logic sites a sized device fills.
 constexpr double kUtilization = 0.7;
 
-// splitmix64: the same sequence on every platform for a seed.
-std::uint64_t NextRandom(std::uint64_t& state) {
-    std::uint64_t z = (state += 0x9E3779B97F4A7C15ull);
-    z = (z ^ (z >> 30)) * 0xBF58476D1CE4E5B9ull;
-    z = (z ^ (z >> 27)) * 0x94D049BB133111EBull;
-    return z ^ (z >> 31);
-}
 
 // The cells in the order of their distance, in nets, from the input ports; the cells of one
 // distance shuffled by the seed, the cells no input reaches last.
