@@ -78,10 +78,7 @@ struct OptionFrame {
 
     static int Run(W& self, int argc, Script::Handle* const* argv, Tcl_Interp* interp) {
         I* object = nullptr;
-        if (self.Object(&object) != 0) {
-            ErrorReport(interp, MethodText(kNoObjectText, W::kClassName, D.word));
-            return SetFailureCode(interp, Failure::Object, kInterface, D.word);
-        }
+        if (self.Object(&object) != 0) return ReportNoObject(interp, W::kClassName, kInterface, D.word);
 
         [[maybe_unused]] std::conditional_t<kMatched, MatchSession, std::monostate> session;
         Script::Handle* const* words = argv;
@@ -116,8 +113,7 @@ struct OptionFrame {
             if (result != 1) return ReportOperationFailure(interp, values.message, kInterface, D.word);
             return StoreResultProperty(values.out, values.message, interp);
         } catch (...) {
-            ErrorReport(interp, MethodText(kExceptionText, W::kClassName, D.word));
-            return SetFailureCode(interp, Failure::Exception, kInterface, D.word);
+            return ReportException(interp, W::kClassName, kInterface, D.word);
         }
     }
 

@@ -74,10 +74,7 @@ struct PlainFrame {
 
     static int Run(W& self, int argc, Script::Handle* const* argv, Tcl_Interp* interp) {
         I* object = nullptr;
-        if (self.Object(&object) != 0) {
-            ErrorReport(interp, MethodText(kNoObjectText, W::kClassName, D.word));
-            return SetFailureCode(interp, Failure::Object, kInterface, D.word);
-        }
+        if (self.Object(&object) != 0) return ReportNoObject(interp, W::kClassName, kInterface, D.word);
         return [&]<size_t... K>(std::index_sequence<K...>) {
             // Out pointers start null, so that an operation that forgets one stores 0, not garbage.
             std::tuple<plain::Local<std::tuple_element_t<K, Params>>...> locals{};
@@ -94,8 +91,7 @@ struct PlainFrame {
                 if (failed == 0 && plain::StoreResult(result, interp) == 0) return 0;
                 return SetFailureCode(interp, Failure::Store, kInterface, D.word);
             } catch (...) {
-                ErrorReport(interp, MethodText(kExceptionText, W::kClassName, D.word));
-                return SetFailureCode(interp, Failure::Exception, kInterface, D.word);
+                return ReportException(interp, W::kClassName, kInterface, D.word);
             }
         }(std::make_index_sequence<R>{});
     }

@@ -85,4 +85,14 @@ Port_String MethodText(const char* text, const char* className, const char* word
     return Port_String(text, className, "::kel_", word);
 }
 
+int ReportNoObject(Tcl_Interp* interp, const char* className, const char* interfaceName, const char* word) {
+    ErrorReport(interp, MethodText(kNoObjectText, className, word));
+    return SetFailureCode(interp, Failure::Object, interfaceName, word);
+}
+
+int ReportException(Tcl_Interp* interp, const char* className, const char* interfaceName, const char* word) {
+    ErrorReport(interp, MethodText(kExceptionText, className, word));
+    return SetFailureCode(interp, Failure::Exception, interfaceName, word);
+}
+
 }  // namespace TcltaskI

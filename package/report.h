@@ -56,6 +56,10 @@ int ErrorReportWithHelp(Tcl_Interp* interp, Port_String text, CitI::IInterface* 
 // "<text><className>::kel_<word>": the texts that name the class and method.
 Port_String MethodText(const char* text, const char* className, const char* word);
 
+// The failures every frame shares, each reported with its text and its code. Give 1.
+int ReportNoObject(Tcl_Interp* interp, const char* className, const char* interfaceName, const char* word);
+int ReportException(Tcl_Interp* interp, const char* className, const char* interfaceName, const char* word);
+
 inline constexpr const char* kNoObjectText = "Failed to get pointer to wrapped object in ";
 inline constexpr const char* kExceptionText = "An exception took place while calling ";
 inline constexpr const char* kWrongCountText = "Wrong number of required arguments specified.";
