@@ -20,6 +20,7 @@
 #include <vector>
 
 #include "CommonI/RefCountPtr.h"
+#include "Script/TclObjRef.h"
 #include "TcltaskI/ITclProject.h"
 
 namespace TcltaskI {
@@ -280,6 +281,17 @@ struct ToolState {
     uint64_t designEpoch = 0;
     // Called after the current design changed: prunes names that no longer exist, resets the view.
     void DesignChanged();
+
+    // Counts every change of what a picture of the state shows: the design (open, reload, close,
+    // import), the view, the highlight, the selection, the floorplan and the timing results. A
+    // window compares it with the count it drew, so that it redraws after a change made through
+    // any command word, the roots' and the objects' alike.
+    uint64_t changes = 0;
+    // Counts one change, and schedules `onChange` for the next idle pass unless it is pending
+    // already: however many changes a script makes, the script runs once after them.
+    void Changed();
+    Script::TclObjRef onChange;   // the script run after changes; empty: none
+    bool onChangePending = false;
 
     SettingTable settings;   // global settings
     ViewState view;
