@@ -343,6 +343,7 @@ enum class Refusal {
     Limit,      // LIMIT: the answer would pass one of the tool's limits
     Value,      // VALUE: an argument the command does not take
     Script,     // SCRIPT <code>: a script's code that cannot leave the body the tool runs
+    NoDisplay,  // NODISPLAY: a picture that needs Tk, which cannot be loaded (no display)
 };
 
 // Sets the error code {KELMAR TOOL <kind> <more>...} on the state's interpreter, while it has one.

@@ -118,6 +118,7 @@ const char* RefusalWord(Refusal kind) {
         case Refusal::Limit: return "LIMIT";
         case Refusal::Value: return "VALUE";
         case Refusal::Script: return "SCRIPT";
+        case Refusal::NoDisplay: return "NODISPLAY";
     }
     return "VALUE";
 }
