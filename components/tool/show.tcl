@@ -19,7 +19,8 @@ namespace eval ::kelmartool::window {
     variable redraws 0        ;# how many windows were redrawn, for whoever measures them
     variable nets marked      ;# the fly-lines drawn: marked or all
     variable threshold 4      ;# pixels the pointer moves before a press is a drag, not a click
-    variable hint "drag: pan   shift-drag or right-drag: zoom to a box   wheel: zoom   click: select   n: fly-lines"
+    variable hint "drag: pan   shift-drag or right-drag: zoom to a box   wheel: zoom   click: select"
+    variable selectionColour #ff00ff
 }
 
 proc ::kelmartool::show {{w .kelmarview}} {
@@ -31,7 +32,7 @@ proc ::kelmartool::show {{w .kelmarview}} {
         canvas $w.c -width 640 -height 480 -background white -highlightthickness 0
         frame $w.bar
         label $w.status -anchor w -text $::kelmartool::window::hint
-        checkbutton $w.nets -text fly-lines -variable ::kelmartool::window::nets -onvalue all -offvalue marked \
+        checkbutton $w.nets -text "fly-lines (n)" -variable ::kelmartool::window::nets -onvalue all -offvalue marked \
             -command ::kelmartool::window::schedule
         pack $w.nets -in $w.bar -side right
         pack $w.status -in $w.bar -side left -fill x -expand 1
@@ -175,6 +176,7 @@ namespace eval ::kelmartool::window {
         set c $w.c
         $c delete all
         variable nets
+        variable selectionColour
         if {[catch {kelmartool::shown} rect] || [catch {kelmartool::scene -nets $nets} scene]} {
             $w.status configure -text "no design open"
             return
@@ -208,15 +210,37 @@ namespace eval ::kelmartool::window {
                     $c create line {*}$xy -fill $outline -width 2 -tags $tags
                 }
                 default {
-                    $c create rectangle {*}$xy -fill $fill -outline $outline -tags $tags
-                    if {$label ne {} && $scale >= 24} {
-                        lassign $xy ax ay bx by
-                        $c create text [expr {($ax + $bx) / 2}] [expr {($ay + $by) / 2}] -text $label \
-                            -font {Helvetica 8} -tags [list label label:$name]
+                    set width [expr {$outline eq $selectionColour ? 3 : 1}]
+                    $c create rectangle {*}$xy -fill $fill -outline $outline -width $width -tags $tags
+                    lassign $xy ax ay bx by
+                    if {$kind eq "prohibited"} {
+                        $c create line $ax $ay $bx $by -fill $outline -tags cross
+                        $c create line $ax $by $bx $ay -fill $outline -tags cross
                     }
+                    if {$label ne {} && $scale >= 24 && $kind ne "device"} { putLabel $c $kind $name $label $ax $ay $bx $by }
                 }
             }
         }
+        # Names stay readable over the fly-lines and the path.
+        $c raise label
+    }
+
+    # A label where it fits, as the SVG picture puts it: above a block, whose inside its cells fill,
+    # inside the top of a bank, in the middle of anything else that is wide enough for it.
+    proc putLabel {c kind name text ax ay bx by} {
+        set font {Helvetica 8}
+        set top [expr {min($ay, $by)}]
+        set x [expr {($ax + $bx) / 2.0}]
+        switch -- $kind {
+            block { set y [expr {$top - 7}] }
+            bank { set y [expr {$top + 9}] }
+            default {
+                if {[font measure $font $text] > abs($bx - $ax) - 2} return
+                set y [expr {($ay + $by) / 2.0}]
+            }
+        }
+        $c create text $x $y -text $text -font $font -fill [expr {$kind eq "block" ? "#2060c0" : "#202020"}] \
+            -tags [list label label:$name]
     }
 
     # The object under a canvas point: the topmost item's kind and name, {} when none.
