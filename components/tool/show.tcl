@@ -7,7 +7,7 @@
 # view and selection interfaces, as a script would, so that `view previous` undoes a zoom or a pan:
 # the wheel calls `view zoom -in`/`-out`, a drag `view pan -delta`, a drag with Shift or with the
 # right button draws a box and calls `view zoom -range` with it, and a click (the pointer moved at
-# most `threshold` pixels) calls `selection new`. The checkbutton "fly-lines", or the key n, draws
+# most `threshold` pixels) calls `selection new`. The checkbutton "fly-lines (n)", or the key n, draws
 # every net meeting the view as a fly-line (`kelmartool::scene -nets all`), not only marked ones.
 #
 # Redrawing: the tool counts the changes of what the scene shows (kelmartool::changes), whatever
