@@ -47,17 +47,22 @@ Design* ToolState::CurrentDesign() const noexcept {
 namespace {
 
 // The idle callback of Changed: runs the state's script at the global level, once for the changes
-// since the last run. The interpreter is preserved, so that a script that deletes it returns here
-// before it goes; its errors are the interpreter's background errors.
+// since the last run. The changes the script makes itself do not schedule it again: a script that
+// changes what it watches would run in every idle pass, and `update idletasks` would never return.
+// The interpreter is preserved, so that a script that deletes it returns here before it goes (and
+// the state with it); its errors are the interpreter's background errors.
 void RunOnChange(ClientData data) {
     auto* state = static_cast<ToolState*>(data);
-    state->onChangePending = false;
     Tcl_Interp* interp = state->interp;
-    if (interp == nullptr || !state->onChange) return;
+    if (interp == nullptr || !state->onChange) {
+        state->onChangePending = false;
+        return;
+    }
     const Script::TclObjRef script = state->onChange;  // the script may replace itself
     Tcl_Preserve(interp);
-    if (const int code = Tcl_EvalObjEx(interp, script.get(), TCL_EVAL_GLOBAL); code != TCL_OK)
-        Tcl_BackgroundException(interp, code);
+    const int code = Tcl_EvalObjEx(interp, script.get(), TCL_EVAL_GLOBAL);
+    state->onChangePending = false;
+    if (code != TCL_OK) Tcl_BackgroundException(interp, code);
     Tcl_Release(interp);
 }
 
