@@ -20,6 +20,7 @@
 #include <vector>
 
 #include "CommonI/RefCountPtr.h"
+#include "Script/TclObjRef.h"
 #include "TcltaskI/ITclProject.h"
 
 namespace TcltaskI {
@@ -281,6 +282,17 @@ struct ToolState {
     // Called after the current design changed: prunes names that no longer exist, resets the view.
     void DesignChanged();
 
+    // Counts every change of what a picture of the state shows: the design (open, reload, close,
+    // import), the view, the highlight, the selection, the floorplan and the timing results. A
+    // window compares it with the count it drew, so that it redraws after a change made through
+    // any command word, the roots' and the objects' alike.
+    uint64_t changes = 0;
+    // Counts one change, and schedules `onChange` for the next idle pass unless it is pending
+    // already: however many changes a script makes, the script runs once after them.
+    void Changed();
+    Script::TclObjRef onChange;   // the script run after changes; empty: none
+    bool onChangePending = false;
+
     SettingTable settings;   // global settings
     ViewState view;
     std::map<std::string, std::string> highlight;  // object -> colour
@@ -331,6 +343,7 @@ enum class Refusal {
     Limit,      // LIMIT: the answer would pass one of the tool's limits
     Value,      // VALUE: an argument the command does not take
     Script,     // SCRIPT <code>: a script's code that cannot leave the body the tool runs
+    NoDisplay,  // NODISPLAY: a picture that needs Tk, which cannot be loaded (no display)
 };
 
 // Sets the error code {KELMAR TOOL <kind> <more>...} on the state's interpreter, while it has one.

@@ -191,6 +191,7 @@ public:
                         result, message))
                 return 0;
             plan = FloorplanData{};
+            state.Changed();
             return 1;
         });
     }
@@ -234,6 +235,7 @@ public:
             if (!Answer(answer, result, message)) return 0;
             plan.constraints = std::move(changed);
             plan.modified = true;
+            state.Changed();
             return 1;
         });
     }
@@ -294,7 +296,7 @@ public:
                 if (std::find(it->cells.begin(), it->cells.end(), cell) == it->cells.end()) it->cells.push_back(cell);
             }
             if (!Answer(NewList(it->cells), result, message)) return 0;
-            Keep(plan, std::move(changed));
+            Keep(state, plan, std::move(changed));
             return 1;
         });
     }
@@ -308,7 +310,7 @@ public:
                 return std::find(names.begin(), names.end(), b.name) != names.end();
             });
             if (!Answer(NewList(BlockList(changed)), result, message)) return 0;
-            Keep(plan, std::move(changed));
+            Keep(state, plan, std::move(changed));
             return 1;
         });
     }
@@ -380,6 +382,7 @@ public:
             if (!Answer(FloorplanProperty(state, changed, key), result, message)) return 0;
             changed.modified = true;
             *plan = std::move(changed);
+            state.Changed();
             return 1;
         });
     }
@@ -436,7 +439,7 @@ public:
                         key == "capacity" ? std::to_string(*ParseCapacity(text)) : text;
                 }
             }
-            return AnswerBlocks(plan, std::move(changed), names, result, message);
+            return AnswerBlocks(state, plan, std::move(changed), names, result, message);
         });
     }
 
@@ -454,7 +457,7 @@ public:
                                   "block " + Quote(b.name) + " has no constraint " + Quote(key));
                 if (key == "region") SetRegion(b, std::nullopt);
             }
-            return AnswerBlocks(plan, std::move(changed), names, result, message);
+            return AnswerBlocks(state, plan, std::move(changed), names, result, message);
         });
     }
 
@@ -540,6 +543,7 @@ public:
             if (!Answer(moved.Take(), result, message)) return 0;
             plan.constraints.ports = std::move(sites);
             plan.modified = true;
+            state.Changed();
             return 1;
         });
     }
@@ -658,6 +662,7 @@ private:
     static RESULT Install(ToolState& state, FloorplanData fresh, Out& result, Msg& message) {
         if (!Answer(FloorplanValue(state, fresh), result, message)) return 0;
         Plan(state) = std::move(fresh);
+        state.Changed();
         return 1;
     }
 
@@ -709,6 +714,7 @@ private:
         if (moved) state.DesignChanged();
         plan->epoch = state.designEpoch;
         plan->modified = false;
+        state.Changed();
         return true;
     }
 
@@ -750,13 +756,14 @@ private:
         return true;
     }
 
-    static void Keep(FloorplanData& plan, FloorplanConstraints changed) {
+    static void Keep(ToolState& state, FloorplanData& plan, FloorplanConstraints changed) {
         plan.constraints = std::move(changed);
         plan.modified = true;
+        state.Changed();
     }
 
-    static RESULT AnswerBlocks(FloorplanData& plan, FloorplanConstraints changed, const std::vector<std::string>& names,
-                               Out& result, Msg& message) {
+    static RESULT AnswerBlocks(ToolState& state, FloorplanData& plan, FloorplanConstraints changed,
+                               const std::vector<std::string>& names, Out& result, Msg& message) {
         FloorplanData preview = plan;
         preview.constraints = changed;
         Tcl_Obj* answer = nullptr;
@@ -768,7 +775,7 @@ private:
             answer = d.Take();
         }
         if (!Answer(answer, result, message)) return 0;
-        Keep(plan, std::move(changed));
+        Keep(state, plan, std::move(changed));
         return 1;
     }
 
@@ -814,6 +821,7 @@ private:
             if (!Answer(NewList(SiteOrder(changed)), result, message)) return 0;
             plan.constraints.prohibited = std::move(changed);
             plan.modified = true;
+            state.Changed();
             return 1;
         });
     }

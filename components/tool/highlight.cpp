@@ -22,6 +22,7 @@ public:
         std::vector<std::string> names;
         if (!ResolveItems(*m_state, items, names, message)) return 0;
         for (const std::string& name : names) m_state->highlight.erase(name);
+        m_state->Changed();
         return Answer(NewInt(static_cast<long long>(m_state->highlight.size())), result, message);
     }
 
@@ -40,6 +41,7 @@ public:
     CommonI::RESULT clear(Out&, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
         m_state->highlight.clear();
+        m_state->Changed();
         return 1;
     }
 
@@ -76,6 +78,7 @@ private:
                           "the highlight would hold " + std::to_string(marked.size()) +
                               " objects, more than max_items " + std::to_string(limit));
         m_state->highlight = std::move(marked);
+        m_state->Changed();
         return Answer(NewInt(static_cast<long long>(m_state->highlight.size())), result, message);
     }
 

@@ -25,6 +25,7 @@ public:
         if (!ResolveItems(*m_state, items, names, message)) return 0;
         std::erase_if(m_state->selection,
                       [&names](const std::string& s) { return std::find(names.begin(), names.end(), s) != names.end(); });
+        m_state->Changed();
         return Answer(NewList(m_state->selection), result, message);
     }
 
@@ -41,6 +42,7 @@ public:
     CommonI::RESULT clear(Out&, Msg& message) override {
         if (!Alive(*m_state, message)) return 0;
         m_state->selection.clear();
+        m_state->Changed();
         return 1;
     }
 
@@ -78,6 +80,7 @@ private:
                           "the selection would hold " + std::to_string(selected.size()) +
                               " objects, more than max_items " + std::to_string(limit));
         m_state->selection = std::move(selected);
+        m_state->Changed();
         return Answer(NewList(m_state->selection), result, message);
     }
 

@@ -3,22 +3,24 @@
 # the package run with no display.
 #
 # Every canvas item carries the tags `kind:<kind>` and `name:<object>`, the status line names the
-# object under the pointer, the wheel zooms through `view zoom -in`/`-out` (so `view previous` undoes
-# it) and a click selects through `selection new` (so `selection current` answers it).
+# object under the pointer (and the mouse's bindings when over none). The mouse works through the
+# view and selection interfaces, as a script would, so that `view previous` undoes a zoom or a pan:
+# the wheel calls `view zoom -in`/`-out`, a drag `view pan -delta`, a drag with Shift or with the
+# right button draws a box and calls `view zoom -range` with it, and a click (the pointer moved at
+# most `threshold` pixels) calls `selection new`. The checkbutton "fly-lines (n)", or the key n, draws
+# every net meeting the view as a fly-line (`kelmartool::scene -nets all`), not only marked ones.
 #
-# Redrawing: the tool's commands that change what the scene shows (view, highlight, selection,
-# floorplan, timing, settings, obj, kelmartool::open and kelmartool::read_netlist) carry a leave trace
-# that schedules one `after idle` redraw; a redraw already pending absorbs the others, so a script
-# changing many objects is redrawn once, in the next idle pass.
+# Redrawing: the tool counts the changes of what the scene shows (kelmartool::changes), whatever
+# command word made them, and runs the window's script once in the idle pass after them. A window
+# is redrawn when the count, its size or the fly-line choice differs from those it was drawn with.
 namespace eval ::kelmartool::window {
-    variable pending {}       ;# the `after idle` id of the redraw to come, {} when none
+    variable pending {}       ;# the `after idle` id of a redraw for a new size, {} when none
     variable windows {}       ;# the open windows
-    variable traced 0         ;# whether the commands carry the redraw trace
-    variable redraws 0        ;# how many redraws were done, for whoever measures them
-    variable watched {::view ::highlight ::selection ::floorplan ::timing ::settings ::obj
-                      ::kelmartool::view ::kelmartool::highlight ::kelmartool::selection
-                      ::kelmartool::floorplan ::kelmartool::timing ::kelmartool::settings ::kelmartool::obj
-                      ::kelmartool::open ::kelmartool::read_netlist}
+    variable redraws 0        ;# how many windows were redrawn, for whoever measures them
+    variable nets marked      ;# the fly-lines drawn: marked or all
+    variable threshold 4      ;# pixels the pointer moves before a press is a drag, not a click
+    variable hint "drag: pan   shift-drag or right-drag: zoom to a box   wheel: zoom   click: select"
+    variable selectionColour #ff00ff
 }
 
 proc ::kelmartool::show {{w .kelmarview}} {
@@ -28,20 +30,32 @@ proc ::kelmartool::show {{w .kelmarview}} {
         toplevel $w
         wm title $w "KelmarTool view"
         canvas $w.c -width 640 -height 480 -background white -highlightthickness 0
-        label $w.status -anchor w -text {}
-        pack $w.status -side bottom -fill x
+        frame $w.bar
+        label $w.status -anchor w -text $::kelmartool::window::hint
+        checkbutton $w.nets -text "fly-lines (n)" -variable ::kelmartool::window::nets -onvalue all -offvalue marked \
+            -command ::kelmartool::window::schedule
+        pack $w.nets -in $w.bar -side right
+        pack $w.status -in $w.bar -side left -fill x -expand 1
+        pack $w.bar -side bottom -fill x
         pack $w.c -side top -fill both -expand 1
         bind $w.c <Configure> ::kelmartool::window::schedule
         bind $w.c <Motion> [list ::kelmartool::window::hover $w %x %y]
-        bind $w.c <Leave> [list $w.status configure -text {}]
-        bind $w.c <ButtonRelease-1> [list ::kelmartool::window::click $w %x %y]
+        bind $w.c <Leave> [list $w.status configure -text $::kelmartool::window::hint]
+        bind $w.c <ButtonPress-1> [list ::kelmartool::window::press $w pan %x %y]
+        bind $w.c <Shift-ButtonPress-1> [list ::kelmartool::window::press $w box %x %y]
+        bind $w.c <ButtonPress-3> [list ::kelmartool::window::press $w box %x %y]
+        bind $w.c <B1-Motion> [list ::kelmartool::window::drag $w %x %y]
+        bind $w.c <B3-Motion> [list ::kelmartool::window::drag $w %x %y]
+        bind $w.c <ButtonRelease-1> [list ::kelmartool::window::release $w %x %y]
+        bind $w.c <ButtonRelease-3> [list ::kelmartool::window::release $w %x %y]
+        bind $w <KeyPress-n> ::kelmartool::window::toggleNets
         bind $w.c <MouseWheel> [list ::kelmartool::window::wheel %D]
         bind $w.c <Button-4> [list ::kelmartool::window::wheel 1]
         bind $w.c <Button-5> [list ::kelmartool::window::wheel -1]
         bind $w <Destroy> [list ::kelmartool::window::forget $w %W]
         lappend windows $w
     }
-    ::kelmartool::window::watch
+    ::kelmartool::changes -command ::kelmartool::window::redrawAll
     ::kelmartool::window::schedule
     return $w
 }
@@ -61,19 +75,26 @@ namespace eval ::kelmartool::window {
         }
     }
 
-    # Puts the redraw trace on the commands that exist and do not carry it yet.
-    proc watch {} {
-        variable watched
-        foreach command $watched {
-            if {[namespace which -command $command] eq {}} continue
-            if {{leave ::kelmartool::window::changed} in [trace info execution $command]} continue
-            trace add execution $command leave ::kelmartool::window::changed
+    # Tk for a picture (kelmartool::snapshot of a PNG): its main window, which a tclsh shows once Tk
+    # is loaded, is withdrawn when this loads it.
+    proc pictureTk {} {
+        if {![catch {package present Tk}]} return
+        loadTk
+        wm withdraw .
+    }
+
+    # The PNG data of a binary PPM picture.
+    proc png {ppm} {
+        set image [image create photo -data $ppm -format ppm]
+        try {
+            return [$image data -format png]
+        } finally {
+            image delete $image
         }
     }
 
-    proc changed {args} { schedule }
-
-    # One redraw in the next idle pass, whatever the number of changes before it.
+    # A redraw in the next idle pass, for a window whose size or fly-line choice changed; a change
+    # of the tool's state comes through kelmartool::changes.
     proc schedule {} {
         variable pending
         variable windows
@@ -83,16 +104,45 @@ namespace eval ::kelmartool::window {
 
     proc forget {w destroyed} {
         variable windows
+        variable drawn
         if {$destroyed ne $w} return
         set windows [lsearch -all -inline -exact -not $windows $w]
+        unset -nocomplain drawn($w)
+        if {![llength $windows]} { ::kelmartool::changes -command {} }
     }
 
+    # Redraws each window whose picture is out of date: drawn at another count of changes, size or
+    # fly-line choice, or not at all.
     proc redrawAll {} {
-        variable pending {}
+        variable pending
         variable windows
         variable redraws
-        incr redraws
-        foreach w $windows { if {[winfo exists $w]} { redraw $w } }
+        variable drawn
+        variable nets
+        after cancel $pending
+        set pending {}
+        foreach w $windows {
+            if {![winfo exists $w]} continue
+            set now [list [::kelmartool::changes] [winfo width $w.c] [winfo height $w.c] $nets]
+            if {[info exists drawn($w)] && $drawn($w) eq $now} continue
+            set drawn($w) $now
+            incr redraws
+            redraw $w
+        }
+    }
+
+    # Draws a window again at the next idle pass even when nothing it shows changed: after a drag
+    # moved its items or drew a box.
+    proc refresh {w} {
+        variable drawn
+        unset -nocomplain drawn($w)
+        schedule
+    }
+
+    proc toggleNets {} {
+        variable nets
+        set nets [expr {$nets eq "all" ? "marked" : "all"}]
+        schedule
     }
 
     # The mapping from sites (y up) to canvas pixels (y down): the rectangle fits the canvas, centred.
@@ -125,7 +175,9 @@ namespace eval ::kelmartool::window {
         variable maps
         set c $w.c
         $c delete all
-        if {[catch {kelmartool::shown} rect] || [catch {kelmartool::scene} scene]} {
+        variable nets
+        variable selectionColour
+        if {[catch {kelmartool::shown} rect] || [catch {kelmartool::scene -nets $nets} scene]} {
             $w.status configure -text "no design open"
             return
         }
@@ -158,15 +210,37 @@ namespace eval ::kelmartool::window {
                     $c create line {*}$xy -fill $outline -width 2 -tags $tags
                 }
                 default {
-                    $c create rectangle {*}$xy -fill $fill -outline $outline -tags $tags
-                    if {$label ne {} && $scale >= 24} {
-                        lassign $xy ax ay bx by
-                        $c create text [expr {($ax + $bx) / 2}] [expr {($ay + $by) / 2}] -text $label \
-                            -font {Helvetica 8} -tags [list label label:$name]
+                    set width [expr {$outline eq $selectionColour ? 3 : 1}]
+                    $c create rectangle {*}$xy -fill $fill -outline $outline -width $width -tags $tags
+                    lassign $xy ax ay bx by
+                    if {$kind eq "prohibited"} {
+                        $c create line $ax $ay $bx $by -fill $outline -tags cross
+                        $c create line $ax $by $bx $ay -fill $outline -tags cross
                     }
+                    if {$label ne {} && $scale >= 24 && $kind ne "device"} { putLabel $c $kind $name $label $ax $ay $bx $by }
                 }
             }
         }
+        # Names stay readable over the fly-lines and the path.
+        $c raise label
+    }
+
+    # A label where it fits, as the SVG picture puts it: above a block, whose inside its cells fill,
+    # inside the top of a bank, in the middle of anything else that is wide enough for it.
+    proc putLabel {c kind name text ax ay bx by} {
+        set font {Helvetica 8}
+        set top [expr {min($ay, $by)}]
+        set x [expr {($ax + $bx) / 2.0}]
+        switch -- $kind {
+            block { set y [expr {$top - 7}] }
+            bank { set y [expr {$top + 9}] }
+            default {
+                if {[font measure $font $text] > abs($bx - $ax) - 2} return
+                set y [expr {($ay + $by) / 2.0}]
+            }
+        }
+        $c create text $x $y -text $text -font $font -fill [expr {$kind eq "block" ? "#2060c0" : "#202020"}] \
+            -tags [list label label:$name]
     }
 
     # The object under a canvas point: the topmost item's kind and name, {} when none.
@@ -186,8 +260,9 @@ namespace eval ::kelmartool::window {
     }
 
     proc hover {w x y} {
+        variable hint
         lassign [objectAt $w $x $y] kind name
-        if {$name eq {}} { $w.status configure -text {}; return }
+        if {$name eq {}} { $w.status configure -text $hint; return }
         set text "$kind $name"
         if {$kind eq "cell" && ![catch {::kelmartool::obj get $name cell_type} type]} { append text "  type $type" }
         if {![catch {::kelmartool::obj get $name site} site]} { append text "  site $site" }
@@ -202,6 +277,65 @@ namespace eval ::kelmartool::window {
         } else {
             catch { ::kelmartool::selection new $name }
         }
+    }
+
+    # A press starts a drag that pans the view, or one that draws a box to zoom to; it is a click
+    # until the pointer moves more than `threshold` pixels away.
+    proc press {w mode x y} {
+        variable presses
+        set presses($w) [dict create mode $mode x $x y $y lastX $x lastY $y moved 0]
+    }
+
+    proc moved {w x y} {
+        variable presses
+        variable threshold
+        if {![info exists presses($w)]} { return 0 }
+        if {[dict get $presses($w) moved]} { return 1 }
+        set far [expr {max(abs($x - [dict get $presses($w) x]), abs($y - [dict get $presses($w) y])) > $threshold}]
+        if {$far} { dict set presses($w) moved 1 }
+        return $far
+    }
+
+    # While dragging, the picture follows the pointer, or the box grows with it; the view changes
+    # once, on release.
+    proc drag {w x y} {
+        variable presses
+        if {![moved $w $x $y]} return
+        set c $w.c
+        set press $presses($w)
+        if {[dict get $press mode] eq "pan"} {
+            $c move all [expr {$x - [dict get $press lastX]}] [expr {$y - [dict get $press lastY]}]
+            dict set presses($w) lastX $x
+            dict set presses($w) lastY $y
+        } else {
+            $c delete box
+            $c create rectangle [dict get $press x] [dict get $press y] $x $y -outline #202020 -dash {4 2} -tags box
+        }
+    }
+
+    proc release {w x y} {
+        variable presses
+        variable maps
+        if {![moved $w $x $y]} {
+            set mode [expr {[info exists presses($w)] ? [dict get $presses($w) mode] : "pan"}]
+            unset -nocomplain presses($w)
+            if {$mode eq "pan"} { click $w $x $y }
+            return
+        }
+        set mode [dict get $presses($w) mode]
+        set x0 [dict get $presses($w) x]
+        set y0 [dict get $presses($w) y]
+        unset presses($w)
+        if {[info exists maps($w)]} {
+            set scale [lindex $maps($w) 2]
+            if {$mode eq "pan"} {
+                # The picture moved with the pointer, so the view moves the other way; y is up in sites.
+                catch { ::kelmartool::view pan -delta [list [expr {($x0 - $x) / $scale}] [expr {($y - $y0) / $scale}]] }
+            } else {
+                catch { ::kelmartool::view zoom -range [concat [toSites $w $x0 $y0] [toSites $w $x $y]] }
+            }
+        }
+        refresh $w
     }
 
     proc wheel {delta} {

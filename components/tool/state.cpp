@@ -44,8 +44,40 @@ Design* ToolState::CurrentDesign() const noexcept {
     return current ? current->GetDesign() : nullptr;
 }
 
+namespace {
+
+// The idle callback of Changed: runs the state's script at the global level, once for the changes
+// since the last run. The changes the script makes itself do not schedule it again: a script that
+// changes what it watches would run in every idle pass, and `update idletasks` would never return.
+// The interpreter is preserved, so that a script that deletes it returns here before it goes (and
+// the state with it); its errors are the interpreter's background errors.
+void RunOnChange(ClientData data) {
+    auto* state = static_cast<ToolState*>(data);
+    Tcl_Interp* interp = state->interp;
+    if (interp == nullptr || !state->onChange) {
+        state->onChangePending = false;
+        return;
+    }
+    const Script::TclObjRef script = state->onChange;  // the script may replace itself
+    Tcl_Preserve(interp);
+    const int code = Tcl_EvalObjEx(interp, script.get(), TCL_EVAL_GLOBAL);
+    state->onChangePending = false;
+    if (code != TCL_OK) Tcl_BackgroundException(interp, code);
+    Tcl_Release(interp);
+}
+
+}  // namespace
+
+void ToolState::Changed() {
+    ++changes;
+    if (interp == nullptr || !onChange || onChangePending) return;
+    onChangePending = true;
+    Tcl_DoWhenIdle(RunOnChange, this);
+}
+
 void ToolState::DesignChanged() {
     ++designEpoch;
+    Changed();
     const Design* design = CurrentDesign();
     auto gone = [design](const std::string& name) { return design == nullptr || !design->Find(name); };
     std::erase_if(selection, gone);
@@ -70,6 +102,9 @@ void ToolState::Shutdown() {
     collections.clear();
     highlight.clear();
     selection.clear();
+    if (onChangePending) Tcl_CancelIdleCall(RunOnChange, this);
+    onChangePending = false;
+    onChange = Script::TclObjRef();
     interp = nullptr;
 }
 
@@ -88,6 +123,7 @@ const char* RefusalWord(Refusal kind) {
         case Refusal::Limit: return "LIMIT";
         case Refusal::Value: return "VALUE";
         case Refusal::Script: return "SCRIPT";
+        case Refusal::NoDisplay: return "NODISPLAY";
     }
     return "VALUE";
 }

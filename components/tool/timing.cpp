@@ -214,6 +214,7 @@ public:
                 if (id != analysis.c_str()) left.push_back(id);
             if (!Answer(NewList(left), result, message)) return 0;
             data.analyses.erase(analysis.c_str());
+            state.Changed();
             return 1;
         });
     }
@@ -265,6 +266,7 @@ public:
         return OnAnalysis(analysis, message, [&](ToolState& state, Analysis& a) -> RESULT {
             a.settings = TimingSettings{};
             a.result.reset();
+            state.Changed();
             return Answer(Settings(state, a), result, message);
         });
     }
@@ -290,6 +292,7 @@ public:
                 return 0;
             }
             Data(state).lastRun = a.id;
+            state.Changed();
             return 1;
         });
     }

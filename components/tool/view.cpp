@@ -246,6 +246,7 @@ private:
             view.history.resize(view.position + 1);
             view.history.push_back(v);
             view.position = view.history.size() - 1;
+            m_state->Changed();
         }
         return Answer(Value(v), result, message);
     }
@@ -259,6 +260,7 @@ private:
         if (direction > 0 && view.position + 1 >= view.history.size())
             return Refuse(*m_state, message, Refusal::State, "there is no next view");
         view.position = direction < 0 ? view.position - 1 : view.position + 1;
+        m_state->Changed();
         return Answer(Value(view.history[view.position]), result, message);
     }
 

@@ -347,13 +347,15 @@ proc fz::designLine {} {
         "file copy -force [q $file] \[project GetFileName\]; project Reload msg" "projmgr ReloadCurrent msg" \
         "project Sync msg" "projmgr SyncCurrent msg"]
 }
-# The view's scene and its picture, over the view or a rectangle of numbers, into the lines' files.
+# The view's scene and its picture, over the view or a rectangle of numbers, into the lines' files;
+# the count of changes and a script for it, which no idle pass runs here.
 proc fz::sceneLine {} {
     set rect "\[list [word number] [word number] [word number] [word number]\]"
     pick [list "kelmartool::scene" "kelmartool::scene -rect $rect" "kelmartool::scene [word option] [word]" \
         "kelmartool::scene -rect [word]" "kelmartool::snapshot [word file]" \
         "kelmartool::snapshot [word file] -width [word number] -height [word number]" \
-        "kelmartool::snapshot [word file] [words 3]"]
+        "kelmartool::snapshot [word file] [words 3]" "kelmartool::scene -nets [word] -rect $rect" \
+        "kelmartool::snapshot [word file] -nets [word] -format [word]" "kelmartool::changes -command [word]"]
 }
 proc fz::closeLine {} {
     pick [list {projmgr CloseCurrent msg} {projmgr Close [project GetFileName] msg} {project Close} \

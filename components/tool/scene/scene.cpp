@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <iterator>
 #include <map>
 #include <optional>
 #include <set>
@@ -59,8 +60,8 @@ constexpr double kPortInset = 0.2;
 // What the scene is made from, gathered once.
 class SceneMaker {
 public:
-    SceneMaker(const ToolState& state, const Design& design, const Viewport& rect)
-        : m_state(state), m_design(design), m_rect(rect) {
+    SceneMaker(const ToolState& state, const Design& design, const Viewport& rect, NetLines nets)
+        : m_state(state), m_design(design), m_rect(rect), m_nets(nets) {
         m_scene.rect = rect;
         const FloorplanData* plan = state.floorplan.get();
         m_plan = plan != nullptr && plan->open && plan->epoch == state.designEpoch ? plan : nullptr;
@@ -287,18 +288,34 @@ private:
         return coords.size() >= 4 && Meets(x0, y0, x1 + 1e-9, y1 + 1e-9);
     }
 
-    // Nets are fly-lines on request: those highlighted or selected.
+    // Nets are fly-lines on request: the marked ones (highlighted or selected) in their colour, and
+    // with NetLines::All the others too, as long as they stay within kFlyLineLimit lines; past it the
+    // walk stops measuring them, and none of them is drawn.
     void Nets() {
+        if (m_nets == NetLines::None) return;
+        std::vector<SceneItem> plain;
+        std::size_t lines = 0;
         for (const Net& net : m_design.nets) {
             const std::string* colour = Highlight(net.name);
-            if (colour == nullptr && !Selected(net.name)) continue;
+            const bool marked = colour != nullptr || Selected(net.name);
+            if (!marked && (m_nets != NetLines::All || lines > kFlyLineLimit)) continue;
             std::vector<const std::string*> ends{&net.driver};
             for (const std::string& load : net.loads) ends.push_back(&load);
             std::vector<double> coords;
             if (!Line(ends, coords)) continue;
-            Add(SceneKind::Net, net.name, std::move(coords), "", colour ? *colour : kSelectionColor, net.name,
-                kLayerNet);
+            if (marked) {
+                Add(SceneKind::Net, net.name, std::move(coords), "", colour ? *colour : kSelectionColor, net.name,
+                    kLayerNet);
+                continue;
+            }
+            lines += coords.size() / 2 - 1;
+            plain.push_back(SceneItem{SceneKind::Net, net.name, std::move(coords), "", kFlyLineColor, net.name,
+                                      kLayerNet});
         }
+        m_scene.flyLinesLeftOut = lines > kFlyLineLimit;
+        if (!m_scene.flyLinesLeftOut)
+            m_scene.items.insert(m_scene.items.end(), std::make_move_iterator(plain.begin()),
+                                 std::make_move_iterator(plain.end()));
     }
 
     void WorstPath() {
@@ -322,6 +339,7 @@ private:
     const ToolState& m_state;
     const Design& m_design;
     const Viewport m_rect;
+    const NetLines m_nets;
     const FloorplanData* m_plan = nullptr;
     std::set<std::string_view> m_selected;
     Scene m_scene;
@@ -329,10 +347,10 @@ private:
 
 }  // namespace
 
-Scene BuildScene(const ToolState& state, const Viewport& rect) {
+Scene BuildScene(const ToolState& state, const Viewport& rect, NetLines nets) {
     const Design* design = state.CurrentDesign();
-    if (design == nullptr) return Scene{rect, 0, false, {}};
-    return SceneMaker(state, *design, rect).Make();
+    if (design == nullptr) return Scene{rect, 0, false, false, {}};
+    return SceneMaker(state, *design, rect, nets).Make();
 }
 
 }  // namespace kelmartool

@@ -53,10 +53,18 @@ struct SceneItem {
     int layer = kLayerDevice;
 };
 
+// Which nets a picture draws as fly-lines, from the driver to each load.
+enum class NetLines {
+    None,    // no net
+    Marked,  // the highlighted or selected nets
+    All,     // every net that meets the rectangle, within kFlyLineLimit
+};
+
 struct Scene {
     Viewport rect;                  // what the picture shows
     std::size_t cellsInView = 0;    // placed cells whose site meets the rectangle
     bool density = false;           // cells drawn as a density grid instead of one by one
+    bool flyLinesLeftOut = false;   // NetLines::All met more lines than kFlyLineLimit: marked nets only
     std::vector<SceneItem> items;   // in layer order
 };
 
@@ -65,14 +73,18 @@ struct Scene {
 inline constexpr std::size_t kDetailCellLimit = 20000;
 // The density grid has at most this many bins a side.
 inline constexpr int kDensityBins = 64;
+// Above this many fly-lines of nets neither highlighted nor selected in the rectangle, none of them is
+// drawn: a star of lines over every net of a large design covers the picture and tells nothing.
+inline constexpr std::size_t kFlyLineLimit = 20000;
 
 // Colours the scene gives, so that tests and renderers name them once.
 inline constexpr const char* kSelectionColor = "#ff00ff";
 inline constexpr const char* kPathColor = "#e00000";
+inline constexpr const char* kFlyLineColor = "#7080a8";  // a net neither highlighted nor selected
 
 // The scene of the current design of `state` inside `rect` (which must have a positive width and
-// height). The design must be open.
-Scene BuildScene(const ToolState& state, const Viewport& rect);
+// height), with the fly-lines of `nets`. The design must be open.
+Scene BuildScene(const ToolState& state, const Viewport& rect, NetLines nets = NetLines::Marked);
 
 // The rectangle the view interface shows now: the last zoom or pan, or the whole device.
 Viewport ShownRect(const ToolState& state);

@@ -120,7 +120,8 @@ std::string SceneSvg(const Scene& scene, int width, int height) {
                       w + "\" height=\"" + h + "\" viewBox=\"0 0 " + w + " " + h +
                       "\" font-family=\"sans-serif\">\n<desc>x " + Number(scene.rect.x) + " y " +
                       Number(scene.rect.y) + " width " + Number(scene.rect.width) + " height " +
-                      Number(scene.rect.height) + (scene.density ? " density" : "") + "</desc>\n<rect width=\"" + w +
+                      Number(scene.rect.height) + (scene.density ? " density" : "") +
+                      (scene.flyLinesLeftOut ? " fly-lines-left-out" : "") + "</desc>\n<rect width=\"" + w +
                       "\" height=\"" + h + "\" fill=\"#f0f0f0\"/>\n";
     for (const SceneItem& item : scene.items) painter.Item(item, out);
     out += "</svg>\n";
