@@ -142,8 +142,9 @@ std::string PlaceSimple(Design& design, const NetlistOptions& options) {
     long long start = 0, placed = 0;
     if (std::string problem = PlaceAnneal(design, seed, start, placed); !problem.empty()) return problem;
     if (std::string problem = design.Index(); !problem.empty()) return problem;
-    // One delay a net, as the model holds one: its span is the half perimeter of its box, the
-    // distance a route from the driver to its farthest load at least crosses.
+    // One delay a net, as the model holds one, from its span: the half perimeter of its box, which
+    // is no shorter than the distance from the driver to its farthest load nor than the least wire
+    // that joins all its ends.
     long long wireLength = 0;
     for (Net& net : design.nets) {
         const int span = NetSpan(design, net);
