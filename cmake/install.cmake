@@ -27,7 +27,8 @@ install(TARGETS ${KELMAR_EXPORTED_LIBRARIES} EXPORT KelmarTargets
   LIBRARY DESTINATION ${KELMAR_INSTALL_PACKAGE_DIR})
 if(TARGET KelmarTool)
   install(TARGETS KelmarTool LIBRARY DESTINATION ${KELMAR_INSTALL_PACKAGE_DIR})
-  install(FILES ${KELMAR_LIB_DIR}/kelmartool_report.tcl ${KELMAR_LIB_DIR}/kelmartool_show.tcl DESTINATION ${KELMAR_INSTALL_PACKAGE_DIR})
+  install(FILES ${KELMAR_LIB_DIR}/kelmartool_report.tcl ${KELMAR_LIB_DIR}/kelmartool_show.tcl
+    ${KELMAR_LIB_DIR}/kelmartool_synth.tcl ${KELMAR_LIB_DIR}/kelmartool_delays.json DESTINATION ${KELMAR_INSTALL_PACKAGE_DIR})
 endif()
 install(FILES ${KELMAR_LIB_DIR}/pkgIndex.tcl DESTINATION ${KELMAR_INSTALL_PACKAGE_DIR})
 if(TARGET kelmarsh)

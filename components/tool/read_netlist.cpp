@@ -1,7 +1,8 @@
 // kelmartool::read_netlist NETLIST.json ?-top MODULE? ?-clock NET=PERIOD ...? ?-device COLSxROWS?
-// ?-seed N? ?-project FILE?: imports a synthesized netlist (netlist/netlist.h), places it, writes it
-// as a design file (by default beside the netlist, NAME.design.json) and opens that as the current
-// project. Nothing is written or opened unless the whole import succeeds.
+// ?-utilization U? ?-seed N? ?-library FILE? ?-project FILE?: imports a synthesized netlist
+// (netlist/netlist.h) with the delays of a delay library (netlist/delay_library.h), places it,
+// writes it as a design file (by default beside the netlist, NAME.design.json) and opens that as
+// the current project. Nothing is written or opened unless the whole import succeeds.
 #include <tcl.h>
 
 #include <cerrno>
@@ -20,7 +21,8 @@ namespace kelmartool {
 namespace {
 
 constexpr const char* kUsage =
-    "netlist ?-top module? ?-clock net=period ...? ?-device colsxrows? ?-seed n? ?-project file?";
+    "netlist ?-top module? ?-clock net=period ...? ?-device colsxrows? ?-utilization u? ?-seed n? ?-library file? "
+    "?-project file?";
 
 // "8x6": columns and rows.
 bool ParseDevice(const std::string& text, int& columns, int& rows) {
@@ -53,8 +55,10 @@ int ReadNetlist(Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
     }
     const std::string file = Tcl_GetString(objv[1]);
     NetlistOptions options;
-    std::string project;
-    static const char* const kOptions[] = {"-top", "-clock", "-device", "-seed", "-project", nullptr};
+    std::string project, library = DefaultDelayLibraryFile();
+    bool utilization = false;
+    static const char* const kOptions[] = {"-top",    "-clock",   "-device",      "-seed",
+                                           "-project", "-library", "-utilization", nullptr};
     for (int i = 2; i < objc; i += 2) {
         int which = 0;
         if (Tcl_GetIndexFromObj(interp, objv[i], kOptions, "option", 0, &which) != TCL_OK) {
@@ -92,15 +96,35 @@ int ReadNetlist(Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
                 options.seed = static_cast<std::uint64_t>(seed);
                 break;
             }
-            default: project = value; break;
+            case 4: project = value; break;
+            case 5: library = value; break;
+            default: {
+                double share = 0;
+                if (Tcl_GetDoubleFromObj(nullptr, objv[i + 1], &share) != TCL_OK || !(share > 0 && share <= 1))
+                    return Fail(interp, *state, Refusal::Value, {},
+                                "-utilization wants a share of the logic sites above 0 and at most 1, not \"" + value +
+                                    "\"");
+                options.utilization = share;
+                utilization = true;
+                break;
+            }
         }
     }
+    // Both would size the device, and one would be ignored without a word.
+    if (utilization && options.columns > 0)
+        return Fail(interp, *state, Refusal::Value, {},
+                    "-device and -utilization both size the device: give one of them");
     if (project.empty()) {
         project = file.ends_with(".json") ? file.substr(0, file.size() - 5) : file;
         project += ".design.json";
     }
 
     std::string text, why;
+    if (!ReadTextFile(library, text, why))
+        return Fail(interp, *state, Refusal::File, {library},
+                    "cannot read the delay library '" + library + "': " + why);
+    if (why = ReadDelayLibrary(library, text, options.library); !why.empty())
+        return Fail(interp, *state, Refusal::File, {library}, why);
     if (!ReadTextFile(file, text, why))
         return Fail(interp, *state, Refusal::File, {file}, "cannot read the netlist '" + file + "': " + why);
     const std::unique_ptr<Design> design = ImportNetlist(file, text, options, why);

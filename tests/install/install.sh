@@ -47,6 +47,8 @@ listing() { (cd "$stage" && find . ! -type d | sed 's|^\.||' | general); }
     echo "$prefix/lib/tcltk/kelmar$version/pkgIndex.tcl"
     echo "$prefix/lib/tcltk/kelmar$version/kelmartool_report.tcl"
     echo "$prefix/lib/tcltk/kelmar$version/kelmartool_show.tcl"
+    echo "$prefix/lib/tcltk/kelmar$version/kelmartool_synth.tcl"
+    echo "$prefix/lib/tcltk/kelmar$version/kelmartool_delays.json"
 } | sort > "$work/expected"
 listing | diff "$work/expected" - || fail "the installed files differ from the expected ones (< expected, > installed)"
 general < "$work/manifest" | diff "$work/expected" - || fail "the manifest lists other files"
@@ -73,6 +75,22 @@ want="$version 2 $package_dir"
 same "tclsh" "$(TCLLIBPATH=$root/lib/tcltk tclsh8.6 "$work/run.tcl" "$design")" "$want"
 # kelmarsh finds the packages beside itself, with no path given.
 same "kelmarsh" "$("$root/bin/kelmarsh" "$work/run.tcl" "$design")" "$want"
+
+# An imported netlist takes its delays from the library installed beside the tool.
+cat > "$work/netlist.tcl" <<'EOF'
+package require KelmarTool
+set fd [open [lindex $argv 0] w]
+puts $fd {{"modules": {"t": {"attributes": {"top": 1},
+  "ports": {"a": {"direction": "input", "bits": [2]}, "y": {"direction": "output", "bits": [3]}},
+  "cells": {"n": {"type": "$_NOT_", "connections": {"A": [2], "Y": [3]}}}}}}}
+close $fd
+set fd [open [kelmartool::read_netlist [lindex $argv 0]]]
+regexp {"delay_library": "([^"]*)"} [read $fd] -> library
+close $fd
+puts [list [kelmartool::obj get n delay] [file dirname $library]]
+EOF
+same "the installed delay library" "$(TCLLIBPATH=$root/lib/tcltk tclsh8.6 "$work/netlist.tcl" "$work/not.json")" \
+    "0.1 $package_dir"
 
 # A C++ program against the installed headers and libraries, through find_package and pkg-config.
 cmake -S "$here" -B "$work/probe" -DCMAKE_PREFIX_PATH="$root" > "$work/probe.log"

@@ -9,6 +9,7 @@
 #include <optional>
 #include <string>
 
+#include "delay_library.h"
 #include "design.h"
 
 namespace kelmartool {
@@ -17,7 +18,9 @@ struct NetlistOptions {
     std::string top;                       // the top module; empty: the one marked "top"
     std::map<std::string, double> clocks;  // net or port name -> period in ns
     int columns = 0, rows = 0;             // the device; 0: sized to the design
+    double utilization = 0.7;              // the share of logic sites a sized device fills, at most
     std::uint64_t seed = 1;
+    DelayLibrary library;                  // the delays of cells and nets
 };
 
 // The period of a clock found on the flip-flops' clock pins that no option names.
@@ -30,9 +33,10 @@ std::unique_ptr<Design> ImportNetlist(const std::string& file, const std::string
 
 // Places the ports of `design` on the edge of its device and its cells on the logic sites inside,
 // one a site, in the order of their distance from the inputs, then anneals the cells (PlaceAnneal);
-// `seed` orders the cells of one level and seeds the annealing.
-// The device is sized to the design unless `columns` and `rows` are given. Empty on success, else why.
-std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t seed);
+// the seed orders the cells of one level and seeds the annealing. The device is sized to the
+// design at the utilization unless columns and rows are given. Then every net takes its delay from
+// the library's net model. Empty on success, else why.
+std::string PlaceSimple(Design& design, const NetlistOptions& options);
 
 // Moves the cells of a placed design over the logic sites of its device, by simulated annealing, to
 // a short total half-perimeter wire length; the ports stay. It starts from the cells shuffled over

@@ -81,7 +81,7 @@ std::string BitName(const std::string& name, const json& node, std::size_t i, st
 
 // What the tool knows of a cell type of its own: which pins drive, which pin clocks it.
 struct TypeInfo {
-    enum Class { Lut, Gate, Ff, Carry, Ram, Other } kind = Other;
+    CellKind kind = CellKind::Other;
     std::vector<std::string> outputs;
     std::string clockPin;  // for a sequential type
     bool known = false;
@@ -89,44 +89,18 @@ struct TypeInfo {
 
 TypeInfo KnownType(const std::string& type) {
     const auto starts = [&](const char* prefix) { return type.starts_with(prefix); };
-    if (type == "$lut") return {TypeInfo::Lut, {"Y"}, "", true};
+    if (type == "$lut") return {CellKind::Lut, {"Y"}, "", true};
     if (starts("$_DFF") || starts("$_SDFF") || starts("$_ALDFF") || starts("$_DFFSR"))
-        return {TypeInfo::Ff, {"Q"}, "C", true};
-    if (starts("$_DLATCH")) return {TypeInfo::Ff, {"Q"}, "E", true};
-    if (starts("$_") && type.ends_with("_")) return {TypeInfo::Gate, {"Y"}, "", true};
-    if (type == "SB_LUT4") return {TypeInfo::Lut, {"O"}, "", true};
-    if (type == "SB_CARRY") return {TypeInfo::Carry, {"CO"}, "", true};
-    if (starts("SB_DFF")) return {TypeInfo::Ff, {"Q"}, "C", true};
+        return {CellKind::Ff, {"Q"}, "C", true};
+    if (starts("$_DLATCH")) return {CellKind::Ff, {"Q"}, "E", true};
+    if (starts("$_") && type.ends_with("_")) return {CellKind::Gate, {"Y"}, "", true};
+    if (type == "SB_LUT4") return {CellKind::Lut, {"O"}, "", true};
+    if (type == "SB_CARRY") return {CellKind::Carry, {"CO"}, "", true};
+    if (starts("SB_DFF")) return {CellKind::Ff, {"Q"}, "C", true};
     if (starts("SB_RAM40_4K"))
-        return {TypeInfo::Ram, {"RDATA"}, type.find("NR") != std::string::npos ? "RCLKN" : "RCLK", true};
+        return {CellKind::Ram, {"RDATA"}, type.find("NR") != std::string::npos ? "RCLKN" : "RCLK", true};
     return {};
 }
-
-const char* ClassWord(TypeInfo::Class kind) {
-    switch (kind) {
-        case TypeInfo::Lut: return "LUT";
-        case TypeInfo::Gate: return "GATE";
-        case TypeInfo::Ff: return "FF";
-        case TypeInfo::Carry: return "CARRY";
-        case TypeInfo::Ram: return "RAM";
-        case TypeInfo::Other: break;
-    }
-    return "OTHER";
-}
-
-// Delays of this first import, in ns: propagation, or clock to output for a sequential cell.
-double DelayOf(TypeInfo::Class kind) {
-    switch (kind) {
-        case TypeInfo::Lut: return 0.45;
-        case TypeInfo::Gate: return 0.2;
-        case TypeInfo::Ff: return 0.3;
-        case TypeInfo::Carry: return 0.1;
-        case TypeInfo::Ram: return 2.0;
-        case TypeInfo::Other: break;
-    }
-    return 0.5;
-}
-double SetupOf(TypeInfo::Class kind) { return kind == TypeInfo::Ram ? 0.3 : kind == TypeInfo::Ff ? 0.1 : 0.0; }
 
 // Nodes 0, 1 and 2 are the constants 0, 1 and x (z is read as x); every other node is a bit.
 constexpr int kConstants = 3;
@@ -341,7 +315,7 @@ private:
                 continue;
             }
             RawCell raw{prefix + cellName, type, KnownType(type), {}, {}};
-            raw.properties["kind"] = ClassWord(raw.info.kind);
+            raw.properties["kind"] = CellKindWord(raw.info.kind);
             for (const auto& [parameter, value] : Object(cell, "parameters", cellPath, false).items())
                 raw.properties["param." + parameter] = value.is_string() ? value.get<std::string>() : value.dump();
             const json& directions = Object(cell, "port_directions", cellPath, false);
@@ -407,8 +381,9 @@ private:
             Cell cell;
             cell.name = Unique(raw.name, "cell");
             cell.type = raw.type;
-            cell.delay = DelayOf(raw.info.kind);
-            cell.setup = SetupOf(raw.info.kind);
+            const CellDelays& delays = m_options.library.Of(raw.type, raw.info.kind);
+            cell.delay = delays.delay;
+            cell.setup = delays.setup;
             cell.sequential = !raw.info.clockPin.empty();
             cell.properties = std::move(raw.properties);
             d.cells.push_back(std::move(cell));
@@ -510,6 +485,8 @@ private:
 
 }  // namespace
 
+CellKind KindOfType(const std::string& type) { return KnownType(type).kind; }
+
 std::unique_ptr<Design> ImportNetlist(const std::string& file, const std::string& text, const NetlistOptions& options,
                                       std::string& error) {
     const std::string where = "cannot import the netlist '" + file + "': ";
@@ -524,7 +501,8 @@ std::unique_ptr<Design> ImportNetlist(const std::string& file, const std::string
         auto design = Importer(root, options).Run();
         design->properties["netlist"] = file;
         design->properties["seed"] = std::to_string(options.seed);
-        if (std::string problem = PlaceSimple(*design, options.columns, options.rows, options.seed); !problem.empty()) {
+        design->properties["delay_library"] = options.library.file;
+        if (std::string problem = PlaceSimple(*design, options); !problem.empty()) {
             error = where + problem;
             return nullptr;
         }

@@ -9,14 +9,15 @@
 
 #include "netlist.h"
 #include "seeded_random.h"
+#include "timing_model.h"
 
 namespace kelmartool {
 
 namespace {
 
-// The share of logic sites a sized device fills.
-constexpr double kUtilization = 0.7;
-
+// The annealing keeps a word for every logic site: a device beyond this (a small -utilization, a
+// huge -device) is refused rather than left to exhaust the memory.
+constexpr long long kMaxPlacedSites = 10'000'000;
 
 // The cells in the order of their distance, in nets, from the input ports; the cells of one
 // distance shuffled by the seed, the cells no input reaches last.
@@ -83,11 +84,15 @@ int NetSpan(const Design& design, const Net& net) {
 
 }  // namespace
 
-std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t seed) {
+std::string PlaceSimple(Design& design, const NetlistOptions& options) {
     const std::size_t cells = design.cells.size(), ports = design.ports.size();
+    int columns = options.columns, rows = options.rows;
+    const std::uint64_t seed = options.seed;
     if (columns == 0 || rows == 0) {
         // Square, with room for the cells inside and the ports on the edge (corners left free).
-        const auto inner = static_cast<long long>(std::ceil(std::sqrt(static_cast<double>(cells) / kUtilization)));
+        const double inside = std::ceil(std::sqrt(static_cast<double>(cells) / options.utilization));
+        if (!(inside <= kMaxSide)) return "the design needs a device wider than " + std::to_string(kMaxSide) + " sites";
+        const auto inner = static_cast<long long>(inside);
         const auto side = std::max({inner, static_cast<long long>((ports + 3) / 4), 1LL}) + 2;
         if (side > kMaxSide) return "the design needs a device wider than " + std::to_string(kMaxSide) + " sites";
         columns = rows = static_cast<int>(side);
@@ -97,6 +102,9 @@ std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t see
     const std::string size = std::to_string(columns) + "x" + std::to_string(rows);
     if (columns < 3 || rows < 3 || columns > kMaxSide || rows > kMaxSide)
         return "the device " + size + " must have from 3 to " + std::to_string(kMaxSide) + " columns and rows";
+    if (logicSites > kMaxPlacedSites)
+        return "the device " + size + " has " + std::to_string(logicSites) + " logic sites, more than the " +
+               std::to_string(kMaxPlacedSites) + " a placement takes";
     if (logicSites < static_cast<long long>(cells))
         return "the device " + size + " has " + std::to_string(logicSites) + " logic sites for " + std::to_string(cells) +
                " cells";
@@ -134,12 +142,14 @@ std::string PlaceSimple(Design& design, int columns, int rows, std::uint64_t see
     long long start = 0, placed = 0;
     if (std::string problem = PlaceAnneal(design, seed, start, placed); !problem.empty()) return problem;
     if (std::string problem = design.Index(); !problem.empty()) return problem;
-    // A net's delay grows with the distance it spans.
+    // One delay a net, as the model holds one, from its span: the half perimeter of its box, which
+    // is no shorter than the distance from the driver to its farthest load nor than the least wire
+    // that joins all its ends.
     long long wireLength = 0;
     for (Net& net : design.nets) {
         const int span = NetSpan(design, net);
         wireLength += span;
-        net.delay = 0.1 + 0.05 * span;
+        net.delay = RoundTime(options.library.NetDelay(span));
     }
     design.properties["wire_length"] = std::to_string(wireLength);
     design.properties["wire_length_start"] = std::to_string(start);
