@@ -1,6 +1,8 @@
 # kelmartool::synth: Verilog to a placed, timed design in one command. Yosys (found on PATH)
-# synthesizes the files into a netlist in a temporary file, which kelmartool::read_netlist imports
-# and which is removed afterwards. The package index sources this file when it loads the tool.
+# synthesizes the files into a netlist that stays beside the project file (alu.design.json and
+# alu.netlist.json), so that the design names a netlist that exists; kelmartool::read_netlist
+# imports it. A failure leaves both files as they were. The package index sources this file when it
+# loads the tool.
 #
 #   kelmartool::synth FILE.v ?FILE.v ...? -top MODULE ?-flow lut4|ice40? ?read_netlist options?
 #
@@ -59,12 +61,18 @@ proc ::kelmartool::synth {args} {
         dict set options -project [file rootname [lindex $files 0]].design.json
     }
 
-    close [file tempfile netlist kelmar_synth.json]
+    # The netlist is written to a temporary file beside its place and takes the place only once yosys
+    # succeeded; the one it replaces is kept aside until the import succeeded too.
+    set project [dict get $options -project]
+    set netlist [regsub {(\.design)?\.json$} $project {}].netlist.json
+    close [file tempfile fresh [file join [file dirname $project] kelmar_synth.json]]
+    set aside ""
+    set placed 0
     try {
         # Absolute names, so that no file is taken for an option; -f verilog, so that no name's
         # ending makes yosys run it as a script.
         set status [catch {
-            exec -ignorestderr {*}$yosys -q -f verilog -p [format [dict get $flows $flow] $top] -o $netlist \
+            exec -ignorestderr {*}$yosys -q -f verilog -p [format [dict get $flows $flow] $top] -o $fresh \
                 {*}[lmap file $files { file normalize $file }] 2>@1
         } output]
         if {$status} {
@@ -75,8 +83,21 @@ proc ::kelmartool::synth {args} {
             synthesis::refuse [list FILE {*}$files] \
                 "yosys could not synthesize [join $files {, }]:\n[join [lrange $lines end-4 end] \n]"
         }
-        return [kelmartool::read_netlist $netlist {*}$options]
+        if {[file exists $netlist]} {
+            close [file tempfile aside [file join [file dirname $project] kelmar_synth_old.json]]
+            file rename -force $netlist $aside
+        }
+        file rename $fresh $netlist
+        set fresh ""
+        set placed 1
+        set result [kelmartool::read_netlist $netlist {*}$options]
+        set placed 0
+        if {$aside ne ""} { file delete $aside }
+        set aside ""
+        return $result
     } finally {
-        file delete $netlist
+        if {$fresh ne ""} { file delete $fresh }
+        if {$placed} { file delete $netlist }
+        if {$aside ne ""} { file rename -force $aside $netlist }
     }
 }
