@@ -20,6 +20,7 @@ namespace eval scale {
     variable here [file dirname [file normalize [info script]]]
     variable rows {}
     variable imports 0
+    variable started [clock milliseconds]
 }
 
 proc scale::Options {argv} {
@@ -214,7 +215,7 @@ proc scale::Window {} {
     if {$::kelmartool::window::redraws < 1} { error "the window did not draw" }
     lappend out window100k "100,000 cells: window opens, first draw" 1 $first
     set drawn $::kelmartool::window::redraws
-    lappend out zoom100k "100,000 cells: window redraw after zoom -in" 1 [Time [dict get $opt -repeat] {
+    lappend out zoom100k "100,000 cells: redraw after zoom -in" 1 [Time [dict get $opt -repeat] {
         kelmartool::view zoom -in
         update
     } {
@@ -222,7 +223,7 @@ proc scale::Window {} {
         update
     }]
     # A second zoom leaves fewer cells in view than the density picture takes over at: each is drawn.
-    lappend out zoom100kcells "100,000 cells: redraw after a 2nd zoom -in (cells)" 1 [Time [dict get $opt -repeat] {
+    lappend out zoom100kcells "100,000 cells: redraw after 2nd zoom -in" 1 [Time [dict get $opt -repeat] {
         kelmartool::view zoom -in
         update
     } {
@@ -252,8 +253,9 @@ proc scale::Report {} {
             }
         }
     }
+    variable started
     puts "\nseconds: the median of the runs (wall time), min and max beside it; cpu s: the\
-          process's CPU time, median"
+          process's CPU time, median. The whole took [format %.0f [expr {([clock milliseconds] - $started) / 1e3}]] s."
 }
 
 proc scale::Json {file} {
