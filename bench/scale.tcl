@@ -2,8 +2,8 @@
 # per-call bench of bench.tcl. Netlists of 5,000 and 50,000 cells come from
 # examples/netlists/generate.tcl and are imported and placed by kelmartool::read_netlist; the
 # 50,000-cell design is then timed and every cell visited. A placed design of 100,000 cells, written
-# here in the tool's own format (placing it would take as long as the rest together), gives the
-# scene, the SVG snapshot and, under a display of its own (xvfb-run -a), the window.
+# here in the tool's own format (placing that many takes minutes), gives the scene, the SVG snapshot
+# and, under a display of its own (xvfb-run -a), the window.
 #
 #   tclsh8.6 scale.tcl -lib DIR -scratch DIR ?-json FILE? ?-xvfb PROGRAM? ?-repeat N?
 #
