@@ -4,7 +4,8 @@
 #   make demo    build and run the tour of the reference tool on the sample design
 #   make docs    build and write docs/commands.md, the command reference, running its examples
 #   make install   install under PREFIX (/usr/local), below DESTDIR when given; make uninstall
-#   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl
+#   make bench   build in Release into build-bench/ and measure one call against native, SWIG and Tcl,
+#                then the tool on designs of 5,000 to 100,000 cells (bench/scale.tcl)
 #   make bench-icount  the same cases in instructions per call, counted under valgrind's callgrind
 #   make fuzz    seeded random command lines under the sanitizers, in build-fuzz/ (not part of make test)
 #   make memcheck  the Tcl tests under valgrind's memcheck against build/ (not part of make test)
@@ -68,7 +69,7 @@ uninstall:
 
 # The benchmark has its own Release build folder and its own packages: swig makes the
 # generated-binding baseline, valgrind counts the instructions of bench-icount. The figures land in
-# $(BENCH_BUILD)/bench.json and bench-icount.json, copied to $(BUILD)/.
+# $(BENCH_BUILD)/bench.json, scale.json and bench-icount.json, copied to $(BUILD)/.
 BENCH_BUILD    ?= build-bench
 BENCH_PACKAGES := swig
 ICOUNT_PACKAGES := valgrind
@@ -84,6 +85,8 @@ bench: bench-deps
 	$(BENCH_CONFIGURE)
 	cmake --build $(BENCH_BUILD) -j $(JOBS) --target run_bench
 	mkdir -p $(BUILD) && cp $(BENCH_BUILD)/bench.json $(BUILD)/bench.json
+	cmake --build $(BENCH_BUILD) -j $(JOBS) --target run_scale
+	cp $(BENCH_BUILD)/scale.json $(BUILD)/scale.json
 
 # Valgrind goes in before the build is configured: the native extension finds its header then.
 bench-icount: bench-deps

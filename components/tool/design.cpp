@@ -172,91 +172,125 @@ std::string Design::TypeOf(std::string_view objectName) const {
 std::optional<Properties> Design::PropertiesOf(std::string_view objectName) const {
     const auto ref = Find(objectName);
     if (!ref) return std::nullopt;
+    return Collect(*ref, objectName, nullptr);
+}
+
+std::optional<std::string> Design::PropertyOf(std::string_view objectName, const std::string& property) const {
+    const auto ref = Find(objectName);
+    if (!ref) return std::nullopt;
+    Properties one = Collect(*ref, objectName, &property);
+    if (one.empty()) return std::nullopt;
+    return std::move(one.begin()->second);
+}
+
+// The properties of an object, or with `only` just that one (none when the object lacks it): a value
+// is worked out only when it is wanted, as some walk every net or cell of the design.
+Properties Design::Collect(const ObjectRef& ref, std::string_view objectName, const std::string* only) const {
     Properties p;
+    const auto own = [&](const Properties& given) {
+        if (only == nullptr) {
+            p = given;
+        } else if (const auto it = given.find(*only); it != given.end()) {
+            p.insert(*it);
+        }
+    };
+    const auto put = [&](const char* key, auto&& value) {
+        if (only == nullptr || *only == key) p[key] = value();
+    };
     auto join = [](const std::vector<std::string>& words) {
         TclValue list(NewList(words));
         return list.Text();
     };
-    switch (ref->kind) {
+    switch (ref.kind) {
         case Kind::Cell: {
-            const Cell& c = cells[ref->index];
-            p = c.properties;
-            p["cell_type"] = c.type;
-            p["site"] = c.site;
-            p["delay"] = Num(c.delay);
-            p["sequential"] = c.sequential ? "1" : "0";
+            const Cell& c = cells[ref.index];
+            own(c.properties);
+            put("cell_type", [&] { return c.type; });
+            put("site", [&] { return c.site; });
+            put("delay", [&] { return Num(c.delay); });
+            put("sequential", [&] { return std::string(c.sequential ? "1" : "0"); });
             if (c.sequential) {
-                p["setup"] = Num(c.setup);
-                p["clock"] = c.clock;
+                put("setup", [&] { return Num(c.setup); });
+                put("clock", [&] { return c.clock; });
             }
-            std::vector<std::string> in, out;
-            for (const Net& n : nets) {
-                if (n.driver == c.name) out.push_back(n.name);
-                if (std::find(n.loads.begin(), n.loads.end(), c.name) != n.loads.end()) in.push_back(n.name);
-            }
-            p["input_nets"] = join(in);
-            p["output_nets"] = join(out);
+            const auto netsOf = [&](bool driven) {
+                std::vector<std::string> found;
+                for (const Net& n : nets)
+                    if (driven ? n.driver == c.name : std::find(n.loads.begin(), n.loads.end(), c.name) != n.loads.end())
+                        found.push_back(n.name);
+                return join(found);
+            };
+            put("input_nets", [&] { return netsOf(false); });
+            put("output_nets", [&] { return netsOf(true); });
             break;
         }
         case Kind::Net: {
-            const Net& n = nets[ref->index];
-            p = n.properties;
-            p["driver"] = n.driver;
-            p["loads"] = join(n.loads);
-            p["fanout"] = std::to_string(n.loads.size());
-            p["delay"] = Num(n.delay);
+            const Net& n = nets[ref.index];
+            own(n.properties);
+            put("driver", [&] { return n.driver; });
+            put("loads", [&] { return join(n.loads); });
+            put("fanout", [&] { return std::to_string(n.loads.size()); });
+            put("delay", [&] { return Num(n.delay); });
             break;
         }
         case Kind::Port: {
-            const IoPort& port = ports[ref->index];
-            p = port.properties;
-            p["direction"] = port.output ? "out" : "in";
-            p["site"] = port.site;
-            p["standard"] = port.standard;
-            std::string bank;
-            if (auto s = device.ParseSite(port.site))
-                if (const Bank* b = device.BankOf(s->x, s->y)) bank = b->name;
-            p["bank"] = bank;
+            const IoPort& port = ports[ref.index];
+            own(port.properties);
+            put("direction", [&] { return std::string(port.output ? "out" : "in"); });
+            put("site", [&] { return port.site; });
+            put("standard", [&] { return port.standard; });
+            put("bank", [&] {
+                std::string bank;
+                if (auto s = device.ParseSite(port.site))
+                    if (const Bank* b = device.BankOf(s->x, s->y)) bank = b->name;
+                return bank;
+            });
             break;
         }
         case Kind::Clock: {
-            const Clock& c = clocks[ref->index];
-            p = c.properties;
-            p["period"] = Num(c.period);
-            p["frequency_mhz"] = Num(1000.0 / c.period);
-            p["net"] = c.net;
+            const Clock& c = clocks[ref.index];
+            own(c.properties);
+            put("period", [&] { return Num(c.period); });
+            put("frequency_mhz", [&] { return Num(1000.0 / c.period); });
+            put("net", [&] { return c.net; });
             break;
         }
         case Kind::Bank: {
-            const Bank& b = device.banks[ref->index];
-            p["x0"] = std::to_string(b.x0);
-            p["y0"] = std::to_string(b.y0);
-            p["x1"] = std::to_string(b.x1);
-            p["y1"] = std::to_string(b.y1);
-            p["sso_limit"] = std::to_string(b.ssoLimit);
-            p["sites"] = std::to_string((static_cast<long long>(b.x1) - b.x0 + 1) * (static_cast<long long>(b.y1) - b.y0 + 1));
+            const Bank& b = device.banks[ref.index];
+            put("x0", [&] { return std::to_string(b.x0); });
+            put("y0", [&] { return std::to_string(b.y0); });
+            put("x1", [&] { return std::to_string(b.x1); });
+            put("y1", [&] { return std::to_string(b.y1); });
+            put("sso_limit", [&] { return std::to_string(b.ssoLimit); });
+            put("sites", [&] {
+                return std::to_string((static_cast<long long>(b.x1) - b.x0 + 1) * (static_cast<long long>(b.y1) - b.y0 + 1));
+            });
             break;
         }
         case Kind::Site: {
-            const int x = static_cast<int>(ref->index % static_cast<std::size_t>(device.columns));
-            const int y = static_cast<int>(ref->index / static_cast<std::size_t>(device.columns));
+            const int x = static_cast<int>(ref.index % static_cast<std::size_t>(device.columns));
+            const int y = static_cast<int>(ref.index / static_cast<std::size_t>(device.columns));
             const std::string siteName = Device::SiteName(x, y);
-            p["x"] = std::to_string(x);
-            p["y"] = std::to_string(y);
-            const Bank* b = device.BankOf(x, y);
-            p["bank"] = b ? b->name : "";
-            std::vector<std::string> occupants;
-            for (const Cell& c : cells)
-                if (c.site == siteName) occupants.push_back(c.name);
-            for (const IoPort& port : ports)
-                if (port.site == siteName) occupants.push_back(port.name);
-            p["occupants"] = join(occupants);
-            p["prohibited"] = prohibited.count(siteName) ? "1" : "0";
+            put("x", [&] { return std::to_string(x); });
+            put("y", [&] { return std::to_string(y); });
+            put("bank", [&] {
+                const Bank* b = device.BankOf(x, y);
+                return b ? b->name : std::string();
+            });
+            put("occupants", [&] {
+                std::vector<std::string> occupants;
+                for (const Cell& c : cells)
+                    if (c.site == siteName) occupants.push_back(c.name);
+                for (const IoPort& port : ports)
+                    if (port.site == siteName) occupants.push_back(port.name);
+                return join(occupants);
+            });
+            put("prohibited", [&] { return std::string(prohibited.count(siteName) ? "1" : "0"); });
             break;
         }
     }
-    p["name"] = std::string(objectName);
-    p["type"] = KindWord(ref->kind);
+    put("name", [&] { return std::string(objectName); });
+    put("type", [&] { return std::string(KindWord(ref.kind)); });
     return p;
 }
 

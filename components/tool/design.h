@@ -171,8 +171,12 @@ public:
     std::string TypeOf(std::string_view name) const;
     // The properties of a named object in name order, built-in ones included, or nothing.
     std::optional<Properties> PropertiesOf(std::string_view name) const;
+    // One of them, worked out alone; nothing when the object or the property does not exist.
+    std::optional<std::string> PropertyOf(std::string_view name, const std::string& property) const;
 
 private:
+    Properties Collect(const ObjectRef& ref, std::string_view name, const std::string* only) const;
+
     std::map<std::string, ObjectRef, std::less<>> m_index;
 };
 

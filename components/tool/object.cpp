@@ -78,12 +78,11 @@ public:
         if (!Alive(*m_state, message)) return 0;
         std::string found;
         if (!One(object, found, message)) return 0;
-        const Properties all = *m_state->CurrentDesign()->PropertiesOf(found);
-        auto it = all.find(property.c_str());
-        if (it == all.end())
+        const std::optional<std::string> value = m_state->CurrentDesign()->PropertyOf(found, property.c_str());
+        if (!value)
             return Refuse(*m_state, message, Refusal::Unknown, {"PROPERTY", property.c_str()},
                           "object '" + found + "' has no property '" + property.c_str() + "'");
-        return Answer(NewText(it->second), result, message);
+        return Answer(NewText(*value), result, message);
     }
 
     CommonI::RESULT properties(const Prop& object, bool descriptors, Out& result, Msg& message) override {

@@ -2,11 +2,13 @@
 // times at the endpoints, slacks, the worst paths and the high-fanout nets.
 #include <algorithm>
 #include <cmath>
+#include <functional>
 #include <limits>
 #include <map>
 #include <optional>
 #include <set>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include <tcl.h>
@@ -202,12 +204,105 @@ private:
     std::set<std::string> m_offClocks;
 };
 
-bool Allowed(const TimingSettings& settings, const char* kind, const std::string& name) {
-    auto it = settings.endpoints.find(kind);
-    if (it == settings.endpoints.end()) return true;
-    const bool listed = std::find(it->second.items.begin(), it->second.items.end(), name) != it->second.items.end();
-    return it->second.side == "only" ? listed : !listed;
-}
+// Where paths may start ("from") or end ("to"): every name, or by the rule of that side "only" the
+// names it lists or all "except" them.
+class EndpointRule {
+public:
+    EndpointRule(const TimingSettings& settings, const char* side) {
+        const auto it = settings.endpoints.find(side);
+        if (it == settings.endpoints.end()) return;
+        m_only = it->second.side == "only";
+        m_ruled = true;
+        m_items.insert(it->second.items.begin(), it->second.items.end());
+    }
+    bool Allows(const std::string& name) const { return !m_ruled || (m_items.count(name) != 0) == m_only; }
+
+private:
+    bool m_ruled = false;
+    bool m_only = false;
+    std::set<std::string_view> m_items;
+};
+
+// Arrival times from one start point at a time. A sweep visits the start's fan-out cone alone: the
+// combinational cells it reaches are taken by their place in `order` (a heap of places), the order a
+// walk over every cell would take them in, so that of two feeders with the same arrival the same one
+// wins. What one sweep set is cleared by the next, so that a sweep costs its cone, not the design.
+class Sweep {
+public:
+    Sweep(const Graph& graph, const std::vector<std::size_t>& order, const std::vector<char>& isEnd)
+        : m_graph(graph), m_order(order), m_isEnd(isEnd) {
+        const std::size_t size = graph.Size();
+        m_place.assign(size, 0);
+        for (std::size_t i = 0; i < order.size(); ++i) m_place[order[i]] = i;
+        m_arrival.assign(size, kUnreached);
+        m_inArrival.assign(size, kUnreached);
+        m_endArrival.assign(size, kUnreached);
+        m_feeder.assign(size, 0);
+        m_endFeeder.assign(size, 0);
+    }
+
+    // Times every path from `start`, launched at `launch`; Ends() then holds the endpoints reached.
+    void From(std::size_t start, double launch) {
+        for (std::size_t n : m_reached) m_inArrival[n] = kUnreached;
+        for (std::size_t n : m_ends) m_endArrival[n] = kUnreached;
+        m_reached.clear();
+        m_ends.clear();
+        m_start = start;
+        m_arrival[start] = launch;
+        Spread(start);
+        while (!m_heap.empty()) {
+            std::pop_heap(m_heap.begin(), m_heap.end(), std::greater<>());
+            const std::size_t n = m_order[m_heap.back()];
+            m_heap.pop_back();
+            m_arrival[n] = m_inArrival[n] + m_graph.CellAt(n).delay;
+            Spread(n);
+        }
+    }
+
+    std::size_t Start() const noexcept { return m_start; }
+    const std::vector<std::size_t>& Ends() const noexcept { return m_ends; }
+    double EndArrival(std::size_t end) const { return m_endArrival[end]; }
+
+    // The latest path of the last sweep to `end`: the start, the cells passed, the end.
+    std::vector<std::string> Points(std::size_t end) const {
+        std::vector<std::string> points{m_graph.Name(end)};
+        for (std::size_t at = m_endFeeder[end]; at != m_start; at = m_feeder[at]) points.push_back(m_graph.Name(at));
+        points.push_back(m_graph.Name(m_start));
+        std::reverse(points.begin(), points.end());
+        return points;
+    }
+
+private:
+    void Spread(std::size_t from) {
+        for (const Edge& e : m_graph.Out(from)) {
+            const double at = m_arrival[from] + e.delay;
+            if (m_graph.Through(e.to) && at > m_inArrival[e.to]) {
+                if (m_inArrival[e.to] == kUnreached) {
+                    m_reached.push_back(e.to);
+                    m_heap.push_back(m_place[e.to]);
+                    std::push_heap(m_heap.begin(), m_heap.end(), std::greater<>());
+                }
+                m_inArrival[e.to] = at;
+                m_feeder[e.to] = from;
+            }
+            if (m_isEnd[e.to] && at > m_endArrival[e.to]) {
+                if (m_endArrival[e.to] == kUnreached) m_ends.push_back(e.to);
+                m_endArrival[e.to] = at;
+                m_endFeeder[e.to] = from;
+            }
+        }
+    }
+
+    const Graph& m_graph;
+    const std::vector<std::size_t>& m_order;
+    const std::vector<char>& m_isEnd;
+    std::vector<std::size_t> m_place;  // node -> its place in the order
+    std::vector<double> m_arrival, m_inArrival, m_endArrival;
+    std::vector<std::size_t> m_feeder, m_endFeeder;
+    std::vector<std::size_t> m_reached, m_ends;  // what the last sweep set
+    std::vector<std::size_t> m_heap;              // places of the cells reached and not yet passed
+    std::size_t m_start = 0;
+};
 
 bool PassesFilters(const TimingSettings& settings, const TimingPath& path) {
     for (const auto& [kind, filter] : settings.filters) {
@@ -232,12 +327,6 @@ bool PassesFilters(const TimingSettings& settings, const TimingPath& path) {
     return true;
 }
 
-bool WorseFirst(const TimingPath& a, const TimingPath& b) {
-    if (a.slack != b.slack) return a.slack < b.slack;
-    if (a.endpoint != b.endpoint) return a.endpoint < b.endpoint;
-    return a.startpoint < b.startpoint;
-}
-
 }  // namespace
 
 bool RunTiming(const Design& design, const TimingSettings& settings, int pathLimit, TimingResult& out,
@@ -255,86 +344,71 @@ bool RunTiming(const Design& design, const TimingSettings& settings, int pathLim
     }
 
     const std::size_t size = graph.Size();
-    auto isStart = [&](std::size_t n) {
-        if (!graph.Active(n) || !Allowed(settings, "from", graph.Name(n))) return false;
+    const EndpointRule from(settings, "from"), to(settings, "to");
+    const auto isStart = [&](std::size_t n) {
+        if (!graph.Active(n) || !from.Allows(graph.Name(n))) return false;
         return graph.IsCell(n) ? graph.CellAt(n).sequential : !graph.PortAt(n).output;
-    };
-    auto isEnd = [&](std::size_t n) {
-        if (!graph.Active(n) || !Allowed(settings, "to", graph.Name(n))) return false;
-        return graph.IsCell(n) ? graph.CellAt(n).sequential : graph.PortAt(n).output;
     };
     auto portDelay = [&](const std::string& port, double general) {
         auto it = constraints.portDelays.find(port);
         return it == constraints.portDelays.end() ? general : it->second;
     };
-    // The capturing clock and required time of an endpoint; nothing when no clock times it.
-    auto required = [&](std::size_t n) -> std::optional<std::pair<std::string, double>> {
+    // Every endpoint with its capturing clock and required time; none when no clock times it.
+    struct Required {
+        const std::string* clock;
+        double time;
+    };
+    std::vector<char> isEnd(size, 0);
+    std::vector<std::optional<Required>> required(size);
+    for (std::size_t n = 0; n < size; ++n) {
+        if (!graph.Active(n) || !to.Allows(graph.Name(n))) continue;
         if (graph.IsCell(n)) {
             const Cell& c = graph.CellAt(n);
-            auto it = constraints.periods.find(c.clock);
-            if (it == constraints.periods.end()) return std::nullopt;
-            return std::make_pair(c.clock, it->second - c.setup - constraints.uncertainty);
+            if (!c.sequential) continue;
+            isEnd[n] = 1;
+            if (auto it = constraints.periods.find(c.clock); it != constraints.periods.end())
+                required[n] = Required{&c.clock, it->second - c.setup - constraints.uncertainty};
+            continue;
         }
+        if (!graph.PortAt(n).output) continue;
+        isEnd[n] = 1;
         const std::string& ref = constraints.referenceClock;
-        if (ref.empty() || graph.ClockOff(ref)) return std::nullopt;
-        return std::make_pair(ref, constraints.periods[ref] - portDelay(graph.Name(n), constraints.outputDelay) -
-                                       constraints.uncertainty);
+        if (ref.empty() || graph.ClockOff(ref)) continue;
+        required[n] = Required{&ref, constraints.periods[ref] - portDelay(graph.Name(n), constraints.outputDelay) -
+                                         constraints.uncertainty};
+    }
+    const auto launch = [&](std::size_t start) {
+        return graph.IsCell(start) ? graph.CellAt(start).delay : portDelay(graph.Name(start), constraints.inputDelay);
     };
 
-    // Every start point on its own, so that each endpoint learns its worst path from every start.
-    std::map<std::size_t, std::vector<TimingPath>> byEndpoint;
-    std::set<std::size_t> unconstrained;
-    std::vector<double> arrival(size), inArrival(size), endArrival(size);
-    std::vector<std::size_t> feeder(size), endFeeder(size);
+    // Every start point on its own, so that each endpoint learns its latest arrival from every start.
+    struct Reach {
+        std::size_t end, start;
+        double arrival, slack;
+    };
+    std::vector<Reach> reaches;
+    std::vector<char> unconstrained(size, 0);
+    Sweep sweep(graph, order, isEnd);
     for (std::size_t start = 0; start < size; ++start) {
         if (!isStart(start)) continue;
         if (!graph.IsCell(start) && (constraints.referenceClock.empty() || graph.ClockOff(constraints.referenceClock)))
             continue;  // an input without a clock to launch it
-        std::fill(inArrival.begin(), inArrival.end(), kUnreached);
-        std::fill(endArrival.begin(), endArrival.end(), kUnreached);
-        std::fill(arrival.begin(), arrival.end(), kUnreached);
-        arrival[start] =
-            graph.IsCell(start) ? graph.CellAt(start).delay : portDelay(graph.Name(start), constraints.inputDelay);
-        auto spread = [&](std::size_t from) {
-            for (const Edge& e : graph.Out(from)) {
-                const double at = arrival[from] + e.delay;
-                if (graph.Through(e.to) && at > inArrival[e.to]) {
-                    inArrival[e.to] = at;
-                    feeder[e.to] = from;
-                }
-                if (isEnd(e.to) && at > endArrival[e.to]) {
-                    endArrival[e.to] = at;
-                    endFeeder[e.to] = from;
-                }
-            }
-        };
-        spread(start);
-        for (std::size_t n : order) {
-            if (inArrival[n] == kUnreached) continue;
-            arrival[n] = inArrival[n] + graph.CellAt(n).delay;
-            spread(n);
-        }
-        for (std::size_t end = 0; end < size; ++end) {
-            if (endArrival[end] == kUnreached) continue;
-            const auto req = required(end);
-            if (!req) {
-                unconstrained.insert(end);
+        sweep.From(start, launch(start));
+        for (std::size_t end : sweep.Ends()) {
+            if (!required[end]) {
+                unconstrained[end] = 1;
                 continue;
             }
-            TimingPath path;
-            path.startpoint = graph.Name(start);
-            path.endpoint = graph.Name(end);
-            path.clock = req->first;
-            path.arrival = RoundTime(endArrival[end]);
-            path.required = RoundTime(req->second);
-            path.slack = RoundTime(req->second - endArrival[end]);
-            path.points.push_back(path.endpoint);
-            for (std::size_t at = endFeeder[end]; at != start; at = feeder[at]) path.points.push_back(graph.Name(at));
-            path.points.push_back(path.startpoint);
-            std::reverse(path.points.begin(), path.points.end());
-            byEndpoint[end].push_back(std::move(path));
+            const double arrival = sweep.EndArrival(end);
+            reaches.push_back({end, start, arrival, RoundTime(required[end]->time - arrival)});
         }
     }
+    // By endpoint, each endpoint's paths worst first.
+    std::sort(reaches.begin(), reaches.end(), [&graph](const Reach& a, const Reach& b) {
+        if (a.end != b.end) return a.end < b.end;
+        if (a.slack != b.slack) return a.slack < b.slack;
+        return graph.Name(a.start) < graph.Name(b.start);
+    });
 
     TimingResult result;
     result.design = design.name;
@@ -345,23 +419,41 @@ bool RunTiming(const Design& design, const TimingSettings& settings, int pathLim
     const TimingSettings::Query* pathQuery = query("paths");
     const std::size_t perEndpoint = pathQuery && pathQuery->hf > 0 ? static_cast<std::size_t>(pathQuery->hf) : 1;
     const int limit = pathQuery && pathQuery->ld > 0 ? pathQuery->ld : pathLimit;
-    for (auto& [end, paths] : byEndpoint) {
-        std::sort(paths.begin(), paths.end(), WorseFirst);
+    std::vector<const Reach*> candidates;  // the worst paths of every endpoint
+    for (std::size_t first = 0, next = 0; first < reaches.size(); first = next) {
+        while (next < reaches.size() && reaches[next].end == reaches[first].end) ++next;
         ++result.endpoints;
-        const double worst = paths.front().slack;
+        const double worst = reaches[first].slack;
         if (!result.worstSlack || worst < *result.worstSlack) result.worstSlack = worst;
         if (worst < 0) {
             ++result.failing;
             result.totalNegativeSlack = RoundTime(result.totalNegativeSlack + worst);
         }
-        for (std::size_t i = 0; i < paths.size() && i < perEndpoint; ++i)
-            if (PassesFilters(settings, paths[i])) result.paths.push_back(paths[i]);
+        for (std::size_t i = first; i < next && i - first < perEndpoint; ++i) candidates.push_back(&reaches[i]);
     }
-    std::sort(result.paths.begin(), result.paths.end(), WorseFirst);
-    if (limit > 0 && result.paths.size() > static_cast<std::size_t>(limit))
-        result.paths.resize(static_cast<std::size_t>(limit));
-    for (std::size_t end : unconstrained)
-        if (!byEndpoint.count(end)) ++result.unconstrained;
+    std::sort(candidates.begin(), candidates.end(), [&graph](const Reach* a, const Reach* b) {
+        if (a->slack != b->slack) return a->slack < b->slack;
+        if (a->end != b->end) return graph.Name(a->end) < graph.Name(b->end);
+        return graph.Name(a->start) < graph.Name(b->start);
+    });
+    // Worst first, the paths the filters pass until the limit has them: only these are traced
+    // again for the cells they pass.
+    bool swept = false;
+    for (const Reach* reach : candidates) {
+        if (limit > 0 && result.paths.size() >= static_cast<std::size_t>(limit)) break;
+        if (!swept || sweep.Start() != reach->start) sweep.From(reach->start, launch(reach->start));
+        swept = true;
+        TimingPath path;
+        path.startpoint = graph.Name(reach->start);
+        path.endpoint = graph.Name(reach->end);
+        path.clock = *required[reach->end]->clock;
+        path.arrival = RoundTime(reach->arrival);
+        path.required = RoundTime(required[reach->end]->time);
+        path.slack = reach->slack;
+        path.points = sweep.Points(reach->end);
+        if (PassesFilters(settings, path)) result.paths.push_back(std::move(path));
+    }
+    for (std::size_t n = 0; n < size; ++n) result.unconstrained += unconstrained[n];
 
     if (const TimingSettings::Query* fanout = query("fanout")) {
         for (const Net& net : design.nets)

@@ -45,10 +45,14 @@ private:
     std::uint64_t state_;
     int columns_ = 0, rows_ = 0;
     std::size_t cells_ = 0;
-    std::vector<Point> at_;                     // cells, then ports
-    std::vector<std::vector<std::size_t>> pins_;  // net -> objects
-    std::vector<bool> annealed_;                // nets measured during the annealing
-    std::vector<std::vector<std::size_t>> nets_;  // cell -> annealed nets
+    // The moves read these at random places: flat arrays of 32-bit indexes, each list of a net or a
+    // cell a run of one array, keep what one move touches in a few cache lines.
+    std::vector<Point> at_;                  // cells, then ports
+    std::vector<std::uint32_t> pinsFrom_;    // net -> its first object in pins_; one more at the end
+    std::vector<std::uint32_t> pins_;        // the objects of every net, net after net
+    std::vector<bool> annealed_;             // nets measured during the annealing
+    std::vector<std::uint32_t> netsFrom_;    // cell -> its first annealed net in nets_; one more at the end
+    std::vector<std::uint32_t> nets_;        // the annealed nets of every cell, cell after cell
     std::vector<int> span_;                     // net -> HPWL at the current placement
     std::vector<int> occupant_;                 // logic site -> cell, -1 free
     std::vector<unsigned> stamp_;
@@ -64,8 +68,8 @@ private:
 
 int Annealer::Span(std::size_t net) const {
     int x0 = std::numeric_limits<int>::max(), y0 = x0, x1 = -1, y1 = -1;
-    for (std::size_t object : pins_[net]) {
-        const Point& p = at_[object];
+    for (std::uint32_t i = pinsFrom_[net], end = pinsFrom_[net + 1]; i < end; ++i) {
+        const Point& p = at_[pins_[i]];
         x0 = std::min(x0, p.x), x1 = std::max(x1, p.x);
         y0 = std::min(y0, p.y), y1 = std::max(y1, p.y);
     }
@@ -74,7 +78,7 @@ int Annealer::Span(std::size_t net) const {
 
 long long Annealer::Total() const {
     long long total = 0;
-    for (std::size_t n = 0; n < pins_.size(); ++n) total += Span(n);
+    for (std::size_t n = 0; n + 1 < pinsFrom_.size(); ++n) total += Span(n);
     return total;
 }
 
@@ -86,7 +90,8 @@ long long Annealer::Delta(std::size_t a, std::size_t b) {
     changed_.clear();
     long long delta = 0;
     const auto measure = [&](std::size_t cell) {
-        for (std::size_t n : nets_[cell]) {
+        for (std::uint32_t i = netsFrom_[cell], end = netsFrom_[cell + 1]; i < end; ++i) {
+            const std::uint32_t n = nets_[i];
             if (stamp_[n] == epoch_) continue;
             stamp_[n] = epoch_;
             const int span = Span(n);
@@ -162,30 +167,43 @@ std::string Annealer::Run(long long& start, long long& placed) {
         occupant_[sites[c]] = static_cast<int>(c);
     }
 
-    pins_.assign(design_.nets.size(), {});
-    nets_.assign(cells_, {});
-    annealed_.assign(design_.nets.size(), false);
-    for (std::size_t n = 0; n < design_.nets.size(); ++n) {
+    const std::size_t netCount = design_.nets.size();
+    pinsFrom_.assign(1, 0);
+    pins_.clear();
+    annealed_.assign(netCount, false);
+    std::vector<std::uint32_t> cellNets(cells_ + 1, 0);  // annealed nets per cell, then where they start
+    for (std::size_t n = 0; n < netCount; ++n) {
         const Net& net = design_.nets[n];
-        std::vector<std::size_t>& pins = pins_[n];
+        const std::size_t first = pins_.size();
         const auto add = [&](const std::string& name) {
-            if (const auto it = index.find(name); it != index.end()) pins.push_back(it->second);
+            if (const auto it = index.find(name); it != index.end()) pins_.push_back(static_cast<std::uint32_t>(it->second));
         };
         add(net.driver);
         for (const std::string& load : net.loads) add(load);
-        std::sort(pins.begin(), pins.end());
-        pins.erase(std::unique(pins.begin(), pins.end()), pins.end());
-        if (pins.size() < 2 || pins.size() > kMaxAnnealPins) continue;
+        const auto begin = pins_.begin() + static_cast<std::ptrdiff_t>(first);
+        std::sort(begin, pins_.end());
+        pins_.erase(std::unique(begin, pins_.end()), pins_.end());
+        pinsFrom_.push_back(static_cast<std::uint32_t>(pins_.size()));
+        const std::size_t count = pins_.size() - first;
+        if (count < 2 || count > kMaxAnnealPins) continue;
         annealed_[n] = true;
-        for (std::size_t object : pins)
-            if (object < cells_) nets_[object].push_back(n);
+        for (std::size_t i = first; i < pins_.size(); ++i)
+            if (pins_[i] < cells_) ++cellNets[pins_[i] + 1];
     }
-    span_.assign(pins_.size(), 0);
-    for (std::size_t n = 0; n < pins_.size(); ++n) {
+    for (std::size_t c = 0; c < cells_; ++c) cellNets[c + 1] += cellNets[c];
+    netsFrom_ = cellNets;
+    nets_.assign(cellNets.back(), 0);
+    for (std::size_t n = 0; n < netCount; ++n) {
+        if (!annealed_[n]) continue;
+        for (std::uint32_t i = pinsFrom_[n]; i < pinsFrom_[n + 1]; ++i)
+            if (pins_[i] < cells_) nets_[cellNets[pins_[i]]++] = static_cast<std::uint32_t>(n);
+    }
+    span_.assign(netCount, 0);
+    for (std::size_t n = 0; n < netCount; ++n) {
         span_[n] = Span(n);
         if (annealed_[n]) cost_ += span_[n];
     }
-    stamp_.assign(pins_.size(), 0u);
+    stamp_.assign(netCount, 0u);
     start = Total();
 
     if (cells_ >= 2 || (cells_ == 1 && logic > 1)) {
