@@ -15,7 +15,7 @@ BUILD      ?= build
 SAN_BUILD  ?= build-san
 JOBS       ?= 2
 PACKAGES   := cmake g++ make tcl8.6 tcl8.6-dev tcl-thread libgtest-dev nlohmann-json3-dev libedit-dev expect \
-              binutils pkg-config yosys tk8.6 xvfb xauth
+              binutils pkg-config yosys tk8.6 xvfb xauth libfreetype-dev libfontconfig-dev fonts-dejavu-core
 CMAKE_ARGS ?=
 
 .PHONY: deps build build-sanitize test test-plain test-sanitize clean demo

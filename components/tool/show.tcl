@@ -243,9 +243,18 @@ namespace eval ::kelmartool::window {
             -tags [list label label:$name]
     }
 
-    # The object under a canvas point: the topmost item's kind and name, {} when none.
+    # Which kind of item the pointer names first where several lie under it: the objects before
+    # the lines drawn over them, so that a fly-line ending in a cell does not hide the cell, and a
+    # bank, which lies under everything, last. Grid, device and density are no objects to name.
+    variable pickOrder {port cell block site prohibited path net bank}
+
+    # The object under a canvas point, {kind name}: of the kind first in pickOrder, the topmost of
+    # those; {} when none.
     proc objectAt {w x y} {
+        variable pickOrder
         set c $w.c
+        set found {}
+        set foundRank [llength $pickOrder]
         foreach id [lreverse [$c find overlapping $x $y $x $y]] {
             set kind {}
             set name {}
@@ -253,10 +262,13 @@ namespace eval ::kelmartool::window {
                 if {[string match kind:* $tag]} { set kind [string range $tag 5 end] }
                 if {[string match name:* $tag]} { set name [string range $tag 5 end] }
             }
-            if {$kind in {grid device density}} continue
-            if {$name ne {}} { return [list $kind $name] }
+            set rank [lsearch -exact $pickOrder $kind]
+            if {$rank >= 0 && $rank < $foundRank && $name ne {}} {
+                set found [list $kind $name]
+                set foundRank $rank
+            }
         }
-        return {}
+        return $found
     }
 
     proc hover {w x y} {

@@ -55,6 +55,9 @@ general < "$work/manifest" | diff "$work/expected" - || fail "the manifest lists
 for library in "$package_dir"/*.so; do
     needed=$(readelf -d "$library")
     [[ $needed != *"[libtcl"* ]] || fail "$library needs libtcl: it must reach Tcl through the stubs"
+    # FreeType and fontconfig write the labels of the tool's PNG snapshots, in the tool's library alone.
+    [[ $library == */libKelmarTool.so || ($needed != *"[libfreetype"* && $needed != *"[libfontconfig"*) ]] ||
+        fail "$library needs FreeType or fontconfig, which only the tool's library may link"
 done
 
 # A stock tclsh, pointed at the staged tree as it would find $prefix/lib/tcltk by itself: both

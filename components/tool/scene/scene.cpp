@@ -43,6 +43,19 @@ const char* CellTypeColor(const std::string& type) noexcept {
     return "#c8c8c8";
 }
 
+// A label goes where it fits: inside a small item, inside the top of a bank, and above a block,
+// whose inside its cells fill.
+std::optional<LabelSpot> PlaceLabel(const SceneItem& item, double px0, double py0, double px1, double py1) {
+    if (item.label.empty() || item.kind == SceneKind::Device) return std::nullopt;
+    const double wide = double(item.label.size()) * kLabelPixels * 0.6;
+    const bool block = item.kind == SceneKind::Block;
+    if (px1 - px0 < wide + 2 || (!block && py1 - py0 < kLabelPixels + 2)) return std::nullopt;
+    const double baseline = block                          ? py0 - 3
+                            : item.kind == SceneKind::Bank ? py0 + kLabelPixels + 1
+                                                           : (py0 + py1) / 2 + kLabelPixels / 3;
+    return LabelSpot{(px0 + px1) / 2, baseline, block ? kBlockLabelColor : kLabelColor};
+}
+
 Viewport ShownRect(const ToolState& state) {
     const ViewState& view = state.view;
     if (!view.history.empty() && view.position < view.history.size()) return view.history[view.position];

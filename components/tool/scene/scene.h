@@ -7,6 +7,7 @@
 #pragma once
 
 #include <cstddef>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -81,6 +82,22 @@ inline constexpr std::size_t kFlyLineLimit = 20000;
 inline constexpr const char* kSelectionColor = "#ff00ff";
 inline constexpr const char* kPathColor = "#e00000";
 inline constexpr const char* kFlyLineColor = "#7080a8";  // a net neither highlighted nor selected
+
+// Labels, as both picture files draw them: in a sans-serif face this many pixels to the em, the
+// size the window's 8-point label font has at Tk's scaling, dark grey, a block's in its outline's blue.
+inline constexpr double kLabelPixels = 11;
+inline constexpr const char* kLabelColor = "#202020";
+inline constexpr const char* kBlockLabelColor = "#2060c0";
+
+// Where a picture writes the label of a rectangle item drawn over the pixels px0..px1 by py0..py1
+// (y down, py0 the top): the middle of the text and its baseline, and its colour.
+struct LabelSpot {
+    double x = 0, baseline = 0;
+    const char* colour = kLabelColor;
+};
+// Nothing for an item with no label, the device, or one that leaves no room for its label (its
+// width judged from the label's length, the same in every renderer).
+std::optional<LabelSpot> PlaceLabel(const SceneItem& item, double px0, double py0, double px1, double py1);
 
 // The scene of the current design of `state` inside `rect` (which must have a positive width and
 // height), with the fly-lines of `nets`. The design must be open.

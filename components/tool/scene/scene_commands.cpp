@@ -14,6 +14,7 @@
 #include <cmath>
 #include <cstdlib>
 #include <exception>
+#include <memory>
 #include <string>
 
 #include "file_io.h"
@@ -169,8 +170,11 @@ bool TkColour(Tcl_Interp* interp, const std::string& name, Rgb& rgb) {
 // The PNG data of the scene: drawn here, made a PNG by a Tk photo image. False with the error left.
 bool ScenePng(Tcl_Interp* interp, const ToolState& state, const Scene& scene, int width, int height, std::string& png) {
     if (!LoadTk(interp, state)) return false;
-    const std::string ppm =
-        ScenePpm(scene, width, height, [interp](const std::string& name, Rgb& rgb) { return TkColour(interp, name, rgb); });
+    // Without a font the picture is still made, with no labels.
+    std::string why;
+    const std::unique_ptr<LabelFont> font = LabelFont::Open(kLabelFamily, kLabelPixels, why);
+    const std::string ppm = ScenePpm(
+        scene, width, height, [interp](const std::string& name, Rgb& rgb) { return TkColour(interp, name, rgb); }, font.get());
     TclValue command(NewList({NewText("::kelmartool::window::png"),
                               Tcl_NewByteArrayObj(reinterpret_cast<const unsigned char*>(ppm.data()),
                                                   static_cast<int>(ppm.size()))}));

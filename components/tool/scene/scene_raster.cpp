@@ -1,10 +1,11 @@
-// The pixel renderer of the scene: rectangles and lines into an RGB buffer, with the SVG renderer's
-// mapping (the rectangle stretched over the picture, y down) and strokes.
+// The pixel renderer of the scene: rectangles, lines and labels into an RGB buffer, with the SVG
+// renderer's mapping (the rectangle stretched over the picture, y down), strokes and label places.
 #include "scene_raster.h"
 
 #include <algorithm>
 #include <cmath>
 #include <map>
+#include <optional>
 #include <vector>
 
 namespace kelmartool {
@@ -13,9 +14,9 @@ namespace {
 
 class Raster {
 public:
-    Raster(const Scene& scene, int width, int height, const ColourOf& colour)
+    Raster(const Scene& scene, int width, int height, const ColourOf& colour, LabelFont* font)
         : m_rect(scene.rect), m_width(width), m_height(height), m_sx(width / scene.rect.width),
-          m_sy(height / scene.rect.height), m_colourOf(colour),
+          m_sy(height / scene.rect.height), m_colourOf(colour), m_font(font),
           m_pixels(std::size_t(width) * std::size_t(height) * 3) {
         Fill(0, 0, width, height, Rgb{0xf0, 0xf0, 0xf0});
     }
@@ -44,16 +45,21 @@ public:
         }
         const double x0 = X(c[0]), x1 = X(c[2]), y0 = Y(c[3]), y1 = Y(c[1]);
         if (filled) Fill(x0, y0, x1, y1, fill);
-        if (!stroked) return;
-        const double width = item.outline == kSelectionColor ? 3 : 1;
-        Line(x0, y0, x1, y0, width, 0, stroke);
-        Line(x1, y0, x1, y1, width, 0, stroke);
-        Line(x1, y1, x0, y1, width, 0, stroke);
-        Line(x0, y1, x0, y0, width, 0, stroke);
-        if (item.kind == SceneKind::Prohibited) {
-            Line(x0, y0, x1, y1, 1, 0, stroke);
-            Line(x0, y1, x1, y0, 1, 0, stroke);
+        if (stroked) {
+            const double width = item.outline == kSelectionColor ? 3 : 1;
+            Line(x0, y0, x1, y0, width, 0, stroke);
+            Line(x1, y0, x1, y1, width, 0, stroke);
+            Line(x1, y1, x0, y1, width, 0, stroke);
+            Line(x0, y1, x0, y0, width, 0, stroke);
+            if (item.kind == SceneKind::Prohibited) {
+                Line(x0, y0, x1, y1, 1, 0, stroke);
+                Line(x0, y1, x1, y0, 1, 0, stroke);
+            }
         }
+        if (m_font == nullptr) return;
+        Rgb ink;
+        if (const std::optional<LabelSpot> spot = PlaceLabel(item, x0, y0, x1, y1); spot && Colour(spot->colour, ink))
+            Text(LabelText(item.label), spot->x, spot->baseline, ink);
     }
 
     std::string Ppm() const {
@@ -125,18 +131,46 @@ private:
         }
     }
 
+    // The text centred on x, on the baseline y, its glyphs' coverage blending `ink` into the pixels
+    // they cover inside the picture. A label far outside costs only the measure of its box.
+    void Text(const std::u32string& text, double x, double y, const Rgb& ink) {
+        const long width = m_font->Advance(text);
+        const double left = x - double(width) / 2, reach = 4 * kLabelPixels;
+        if (left + double(width) + reach < 0 || left - reach > m_width || y + reach < 0 || y - reach > m_height) return;
+        long pen = std::lround(left);
+        const long baseline = std::lround(y);
+        for (const char32_t c : text) {
+            const LabelFont::Glyph& glyph = m_font->GlyphOf(c);
+            const long gx = pen + glyph.left, gy = baseline - glyph.top;
+            for (long row = std::max(0L, -gy); row < glyph.rows && gy + row < m_height; ++row)
+                for (long col = std::max(0L, -gx); col < glyph.width && gx + col < m_width; ++col)
+                    Blend(gx + col, gy + row, ink, glyph.coverage[std::size_t(row) * std::size_t(glyph.width) + std::size_t(col)]);
+            pen += glyph.advance;
+        }
+    }
+
+    void Blend(long x, long y, const Rgb& c, unsigned coverage) {
+        if (coverage == 0) return;
+        unsigned char* p = &m_pixels[(std::size_t(y) * std::size_t(m_width) + std::size_t(x)) * 3];
+        auto mix = [coverage](unsigned char under, unsigned char over) {
+            return static_cast<unsigned char>((over * coverage + under * (255 - coverage) + 127) / 255);
+        };
+        p[0] = mix(p[0], c.r), p[1] = mix(p[1], c.g), p[2] = mix(p[2], c.b);
+    }
+
     Viewport m_rect;
     int m_width, m_height;
     double m_sx, m_sy;
     const ColourOf& m_colourOf;
+    LabelFont* m_font;
     std::map<std::string, std::pair<bool, Rgb>> m_known;
     std::vector<unsigned char> m_pixels;
 };
 
 }  // namespace
 
-std::string ScenePpm(const Scene& scene, int width, int height, const ColourOf& colour) {
-    Raster raster(scene, width, height, colour);
+std::string ScenePpm(const Scene& scene, int width, int height, const ColourOf& colour, LabelFont* font) {
+    Raster raster(scene, width, height, colour, font);
     for (const SceneItem& item : scene.items) raster.Item(item);
     return raster.Ppm();
 }

@@ -5,6 +5,7 @@
 #include <string>
 
 #include "scene.h"
+#include "scene_font.h"
 
 namespace kelmartool {
 
@@ -16,8 +17,8 @@ struct Rgb {
 using ColourOf = std::function<bool(const std::string& name, Rgb& colour)>;
 
 // The PPM data of `scene` in a picture of `width` by `height` pixels, drawn as the SVG renderer draws
-// it (the same extent, colours, outlines and dashes) except for the labels. A colour `colour` does
-// not know is left out: its fill or its outline is not drawn.
-std::string ScenePpm(const Scene& scene, int width, int height, const ColourOf& colour);
+// it (the same extent, colours, outlines, dashes and labels). A colour `colour` does not know is left
+// out: its fill or its outline is not drawn. Labels are written in `font`; with none, left out.
+std::string ScenePpm(const Scene& scene, int width, int height, const ColourOf& colour, LabelFont* font);
 
 }  // namespace kelmartool

@@ -10,8 +10,6 @@ namespace kelmartool {
 
 namespace {
 
-constexpr double kFontPx = 11;
-
 // Attribute and text content: the five XML specials escaped, the controls XML 1.0 forbids replaced.
 std::string Escape(std::string_view text) {
     std::string out;
@@ -93,17 +91,11 @@ public:
             out += "<path d=\"M" + Number(px0) + " " + Number(py0) + "L" + Number(px1) + " " + Number(py1) + "M" +
                    Number(px0) + " " + Number(py1) + "L" + Number(px1) + " " + Number(py0) + "\" stroke=\"" + stroke +
                    "\"/>\n";
-        if (item.label.empty() || item.kind == SceneKind::Device) return;
-        // A label goes where it fits: inside a small item, inside the top of a bank, and above a
-        // block, whose inside its cells fill.
-        const double wide = double(item.label.size()) * kFontPx * 0.6;
-        const bool block = item.kind == SceneKind::Block;
-        if (px1 - px0 < wide + 2 || (!block && py1 - py0 < kFontPx + 2)) return;
-        const double ty = block                          ? py0 - 3
-                          : item.kind == SceneKind::Bank ? py0 + kFontPx + 1
-                                                         : (py0 + py1) / 2 + kFontPx / 3;
-        out += "<text x=\"" + Number((px0 + px1) / 2) + "\" y=\"" + Number(ty) + "\" font-size=\"" + Number(kFontPx) +
-               "\" text-anchor=\"middle\" fill=\"" + (block ? "#2060c0" : "#202020") + "\">" + Escape(item.label) + "</text>\n";
+        const std::optional<LabelSpot> spot = PlaceLabel(item, px0, py0, px1, py1);
+        if (!spot) return;
+        out += "<text x=\"" + Number(spot->x) + "\" y=\"" + Number(spot->baseline) + "\" font-size=\"" +
+               Number(kLabelPixels) + "\" text-anchor=\"middle\" fill=\"" + spot->colour + "\">" + Escape(item.label) +
+               "</text>\n";
     }
 
 private:
