@@ -125,7 +125,10 @@ private:
         for (long i = 0; i <= steps; ++i) {
             const double t = t0 + (t1 - t0) * double(i) / double(steps);
             if (dash > 0 && std::fmod(t * length, 2 * dash) >= dash) continue;
-            const long px = std::lround(x0 + dx * t - 0.5), py = std::lround(y0 + dy * t - 0.5);
+            // The pixel a point falls in. Rounding `v - 0.5` instead would flip between two pixels
+            // at whole coordinates (a grid line's) as the steps' rounding errors add up, and leave
+            // gaps in the line.
+            const long px = std::lround(std::floor(x0 + dx * t + 1e-9)), py = std::lround(std::floor(y0 + dy * t + 1e-9));
             for (long oy = -half; oy <= reach; ++oy)
                 for (long ox = -half; ox <= reach; ++ox) Put(px + ox, py + oy, c);
         }
