@@ -40,17 +40,11 @@ namespace eval bench {
     variable dumps 0
 }
 
+source [file join [file dirname [file normalize [info script]]] options.tcl]
+
 proc bench::Options {argv} {
     variable opt
-    if {[llength $argv] % 2} {
-        error "usage: bench.tcl ?-mode time|icount? -lib DIR -native FILE ?-swig FILE? ?-json FILE? ?-rounds N? ?-seconds S? ?-calls N? ?-count N? ?-dumps FILE?"
-    }
-    foreach {name value} $argv {
-        if {![dict exists $opt $name]} {
-            error "unknown option \"$name\": must be one of [join [dict keys $opt] {, }]"
-        }
-        dict set opt $name $value
-    }
+    benchOptions opt $argv "bench.tcl ?-mode time|icount? -lib DIR -native FILE ?-swig FILE? ?-json FILE? ?-rounds N? ?-seconds S? ?-calls N? ?-count N? ?-dumps FILE?"
     set needed {-lib -native}
     switch -- [dict get $opt -mode] {
         time {}

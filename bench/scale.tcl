@@ -23,17 +23,11 @@ namespace eval scale {
     variable started [clock milliseconds]
 }
 
+source [file join [file dirname [file normalize [info script]]] options.tcl]
+
 proc scale::Options {argv} {
     variable opt
-    if {[llength $argv] % 2} {
-        error "usage: scale.tcl -lib DIR -scratch DIR ?-json FILE? ?-xvfb PROGRAM? ?-repeat N?"
-    }
-    foreach {name value} $argv {
-        if {![dict exists $opt $name]} {
-            error "unknown option \"$name\": must be one of [join [dict keys $opt] {, }]"
-        }
-        dict set opt $name $value
-    }
+    benchOptions opt $argv "scale.tcl -lib DIR -scratch DIR ?-json FILE? ?-xvfb PROGRAM? ?-repeat N?"
     foreach name {-lib -scratch} {
         if {[dict get $opt $name] eq {}} { error "missing $name" }
     }
