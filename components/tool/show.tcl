@@ -217,7 +217,7 @@ namespace eval ::kelmartool::window {
                         $c create line $ax $ay $bx $by -fill $outline -tags cross
                         $c create line $ax $by $bx $ay -fill $outline -tags cross
                     }
-                    if {$label ne {} && $scale >= 24 && $kind ne "device"} { putLabel $c $kind $name $label $ax $ay $bx $by }
+                    if {$label ne {} && $scale >= 24 && $kind ne "device"} { putLabel $c $kind $name $label $fill $ax $ay $bx $by }
                 }
             }
         }
@@ -226,8 +226,9 @@ namespace eval ::kelmartool::window {
     }
 
     # A label where it fits, as the SVG picture puts it: above a block, whose inside its cells fill,
-    # inside the top of a bank, in the middle of anything else that is wide enough for it.
-    proc putLabel {c kind name text ax ay bx by} {
+    # inside the top of a bank, in the middle of anything else that is wide enough for it; there on
+    # the item's fill, so that lines crossing it leave it readable.
+    proc putLabel {c kind name text fill ax ay bx by} {
         set font {Helvetica 8}
         set top [expr {min($ay, $by)}]
         set x [expr {($ax + $bx) / 2.0}]
@@ -239,8 +240,12 @@ namespace eval ::kelmartool::window {
                 set y [expr {($ay + $by) / 2.0}]
             }
         }
-        $c create text $x $y -text $text -font $font -fill [expr {$kind eq "block" ? "#2060c0" : "#202020"}] \
-            -tags [list label label:$name]
+        set id [$c create text $x $y -text $text -font $font -fill [expr {$kind eq "block" ? "#2060c0" : "#202020"}] \
+            -tags [list label label:$name]]
+        if {$kind ni {block bank} && $fill ne {}} {
+            lassign [$c bbox $id] tx0 ty0 tx1 ty1
+            $c lower [$c create rectangle $tx0 $ty0 $tx1 $ty1 -fill $fill -outline {} -tags [list label label:$name]] $id
+        }
     }
 
     # Which kind of item the pointer names first where several lie under it: the objects before

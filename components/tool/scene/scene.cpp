@@ -53,7 +53,8 @@ std::optional<LabelSpot> PlaceLabel(const SceneItem& item, double px0, double py
     const double baseline = block                          ? py0 - 3
                             : item.kind == SceneKind::Bank ? py0 + kLabelPixels + 1
                                                            : (py0 + py1) / 2 + kLabelPixels / 3;
-    return LabelSpot{(px0 + px1) / 2, baseline, block ? kBlockLabelColor : kLabelColor};
+    const bool filled = !block && item.kind != SceneKind::Bank && !item.fill.empty();
+    return LabelSpot{(px0 + px1) / 2, baseline, block ? kBlockLabelColor : kLabelColor, filled ? &item.fill : nullptr};
 }
 
 Viewport ShownRect(const ToolState& state) {

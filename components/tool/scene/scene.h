@@ -94,6 +94,10 @@ inline constexpr const char* kBlockLabelColor = "#2060c0";
 struct LabelSpot {
     double x = 0, baseline = 0;
     const char* colour = kLabelColor;
+    // The colour laid behind the letters, the item's own fill, so that a fly-line or the path
+    // crossing the item leaves its name readable; null for a label outside its item's fill (a
+    // block's, a bank's) or an item with none.
+    const std::string* backing = nullptr;
 };
 // Nothing for an item with no label, the device, or one that leaves no room for its label (its
 // width judged from the label's length, the same in every renderer).

@@ -57,9 +57,24 @@ public:
             }
         }
         if (m_font == nullptr) return;
-        Rgb ink;
-        if (const std::optional<LabelSpot> spot = PlaceLabel(item, x0, y0, x1, y1); spot && Colour(spot->colour, ink))
-            Text(LabelText(item.label), spot->x, spot->baseline, ink);
+        Rgb ink, backing;
+        if (const std::optional<LabelSpot> spot = PlaceLabel(item, x0, y0, x1, y1); spot && Colour(spot->colour, ink)) {
+            const bool backed = spot->backing && Colour(*spot->backing, backing);
+            m_labels.push_back({&item, spot->x, spot->baseline, ink, backed, backing});
+        }
+    }
+
+    // The labels, after every shape and line, so that none covers a name.
+    void Labels() {
+        for (const Label& label : m_labels) {
+            const std::u32string text = LabelText(label.item->label);
+            if (label.backed) {  // the letters' box and a pixel around it, from the descent to the caps
+                const double half = double(m_font->Advance(text)) / 2 + 1;
+                Fill(label.x - half, label.baseline - kLabelPixels * 0.8 - 1, label.x + half,
+                     label.baseline + kLabelPixels * 0.25 + 1, label.backing);
+            }
+            Text(text, label.x, label.baseline, label.ink);
+        }
     }
 
     std::string Ppm() const {
@@ -161,6 +176,14 @@ private:
         p[0] = mix(p[0], c.r), p[1] = mix(p[1], c.g), p[2] = mix(p[2], c.b);
     }
 
+    struct Label {
+        const SceneItem* item;
+        double x, baseline;
+        Rgb ink;
+        bool backed;
+        Rgb backing;
+    };
+
     Viewport m_rect;
     int m_width, m_height;
     double m_sx, m_sy;
@@ -168,6 +191,7 @@ private:
     LabelFont* m_font;
     std::map<std::string, std::pair<bool, Rgb>> m_known;
     std::vector<unsigned char> m_pixels;
+    std::vector<Label> m_labels;
 };
 
 }  // namespace
@@ -175,6 +199,7 @@ private:
 std::string ScenePpm(const Scene& scene, int width, int height, const ColourOf& colour, LabelFont* font) {
     Raster raster(scene, width, height, colour, font);
     for (const SceneItem& item : scene.items) raster.Item(item);
+    raster.Labels();
     return raster.Ppm();
 }
 

@@ -48,7 +48,9 @@ public:
     std::string X(double x) const { return Number((x - m_rect.x) * m_sx); }
     std::string Y(double y) const { return Number((m_rect.y + m_rect.height - y) * m_sy); }
 
-    void Item(const SceneItem& item, std::string& out) const {
+    // Writes the item's element to `out` and its label to `labels`, which follow every element, so
+    // that no line or later shape covers a name.
+    void Item(const SceneItem& item, std::string& out, std::string& labels) const {
         const std::string head = "id=\"" + Escape(item.name) + "\" class=\"" + SceneKindWord(item.kind) + "\"";
         const std::string title = "<title>" + Escape(item.name) + "</title>";
         const std::string stroke = item.outline.empty() ? "none" : Escape(item.outline);
@@ -93,8 +95,10 @@ public:
                    "\"/>\n";
         const std::optional<LabelSpot> spot = PlaceLabel(item, px0, py0, px1, py1);
         if (!spot) return;
-        out += "<text x=\"" + Number(spot->x) + "\" y=\"" + Number(spot->baseline) + "\" font-size=\"" +
-               Number(kLabelPixels) + "\" text-anchor=\"middle\" fill=\"" + spot->colour + "\">" + Escape(item.label) +
+        labels += "<text x=\"" + Number(spot->x) + "\" y=\"" + Number(spot->baseline) + "\" font-size=\"" +
+               Number(kLabelPixels) + "\" text-anchor=\"middle\" fill=\"" + spot->colour +
+                  (spot->backing ? "\" stroke=\"" + Escape(*spot->backing) + "\" stroke-width=\"3\" paint-order=\"stroke" : "") +
+                  "\">" + Escape(item.label) +
                "</text>\n";
     }
 
@@ -115,7 +119,9 @@ std::string SceneSvg(const Scene& scene, int width, int height) {
                       Number(scene.rect.height) + (scene.density ? " density" : "") +
                       (scene.flyLinesLeftOut ? " fly-lines-left-out" : "") + "</desc>\n<rect width=\"" + w +
                       "\" height=\"" + h + "\" fill=\"#f0f0f0\"/>\n";
-    for (const SceneItem& item : scene.items) painter.Item(item, out);
+    std::string labels;
+    for (const SceneItem& item : scene.items) painter.Item(item, out, labels);
+    out += labels;
     out += "</svg>\n";
     return out;
 }
