@@ -20,6 +20,8 @@ namespace eval fz {
     variable tags 0
     variable log {}
     variable injected 0
+    variable here [file dirname [file normalize [info script]]]
+    variable netlists {}     ;# the sample netlist, and the shipped delay library, as texts
 }
 
 proc fz::upto {n} { expr {int(rand() * $n)} }
@@ -271,9 +273,10 @@ set fz::jsonValues [list 1e-400 -1 0 4294967304 2147483648 -2147483649 1.5 null 
 
 # A sample design with up to `most` of its numbers and strings replaced, fields deleted or its tail
 # cut, written into one of a few files.
-proc fz::mutant {{most 4}} {
+# A mutant of one of `texts` (by default the sample designs), written to one of `names`.
+proc fz::mutant {{most 4} {texts {}} {names {d0.json d1.json d2.json}}} {
     variable designs
-    set text [pick $designs]
+    set text [pick [expr {[llength $texts] ? $texts : $designs}]]
     for {set k [upto [expr {$most + 1}]]} {$k > 0} {incr k -1} {
         set spans [regexp -all -indices -inline -- {-?\d+(?:\.\d+)?(?:[eE][-+]?\d+)?|"(?:[^"\\]|\\.)*"} $text]
         if {![llength $spans]} break
@@ -297,7 +300,7 @@ proc fz::mutant {{most 4}} {
             }
         }
     }
-    set file [pick {d0.json d1.json d2.json}]
+    set file [pick $names]
     set channel [open $file w]
     fconfigure $channel -translation binary
     puts -nonewline $channel $text
@@ -321,7 +324,7 @@ set fz::classes {
     kit 40 kitLine  tool 30 toolLine  design 4 designLine  close 2 closeLine  make 3 makeLine
     rename 2 renameLine  delete 2 deleteLine  namespace 1 namespaceLine  trace 1 traceLine
     highlight 1 highlightLine  child 1 childLine  childcall 2 childCallLine  register 2 registerLine
-    wrap 2 wrapLine  fault 1 faultLine  scene 2 sceneLine
+    wrap 2 wrapLine  fault 1 faultLine  scene 2 sceneLine  netlist 1 netlistLine
 }
 
 proc fz::kitLine {} {
@@ -356,6 +359,16 @@ proc fz::sceneLine {} {
         "kelmartool::snapshot [word file] -width [word number] -height [word number]" \
         "kelmartool::snapshot [word file] [words 3]" "kelmartool::scene -nets [word] -rect $rect" \
         "kelmartool::snapshot [word file] -nets [word] -format [word]" "kelmartool::changes -command [word]"]
+}
+# An import of a mutant of the sample netlist, with one of the options, hostile words among them,
+# or a mutant of the shipped delay library.
+proc fz::netlistLine {} {
+    variable netlists
+    lassign $netlists netlist library
+    set options [pick [list {} "-seed [word number]" "-device [word]" "-utilization [word number]" \
+        "-clock [word]" "-clock clk=[word number]" "-top [word]" "[word option] [word]" \
+        "-library [q [mutant 3 [list $library] {l0.json}]]"]]
+    return "kelmartool::read_netlist [q [mutant 3 [list $netlist] {n0.json n1.json}]] $options -project p.design.json"
 }
 proc fz::closeLine {} {
     pick [list {projmgr CloseCurrent msg} {projmgr Close [project GetFileName] msg} {project Close} \
@@ -556,6 +569,13 @@ proc fz::act {} {
 proc fz::setup {samples} {
     variable designs; variable tool; variable roots
     hostileWords
+    variable here; variable netlists
+    set netlists {}
+    foreach file [list [file join $here netlist.json] [file join $here .. .. components tool netlist default_delays.json]] {
+        set channel [open $file]
+        lappend netlists [read $channel]
+        close $channel
+    }
     set designs {}
     foreach sample $samples {
         set channel [open $sample]
