@@ -13,6 +13,8 @@
 # Redrawing: the tool counts the changes of what the scene shows (kelmartool::changes), whatever
 # command word made them, and runs the window's script once in the idle pass after them. A window
 # is redrawn when the count, its size or the fly-line choice differs from those it was drawn with.
+# A script set there before the first window opened still runs, before the redraw, and is set back
+# when the last window closes.
 namespace eval ::kelmartool::window {
     variable pending {}       ;# the `after idle` id of a redraw for a new size, {} when none
     variable windows {}       ;# the open windows
@@ -21,6 +23,7 @@ namespace eval ::kelmartool::window {
     variable threshold 4      ;# pixels the pointer moves before a press is a drag, not a click
     variable hint "drag: pan   shift-drag or right-drag: zoom to a box   wheel: zoom   click: select"
     variable selectionColour #ff00ff
+    variable chained {}       ;# the change script set before the first window opened
 }
 
 proc ::kelmartool::show {{w .kelmarview}} {
@@ -55,7 +58,11 @@ proc ::kelmartool::show {{w .kelmarview}} {
         bind $w <Destroy> [list ::kelmartool::window::forget $w %W]
         lappend windows $w
     }
-    ::kelmartool::changes -command ::kelmartool::window::redrawAll
+    set script [::kelmartool::changes -command]
+    if {$script ne "::kelmartool::window::changed"} {
+        set ::kelmartool::window::chained $script
+        ::kelmartool::changes -command ::kelmartool::window::changed
+    }
     ::kelmartool::window::schedule
     return $w
 }
@@ -108,7 +115,20 @@ namespace eval ::kelmartool::window {
         if {$destroyed ne $w} return
         set windows [lsearch -all -inline -exact -not $windows $w]
         unset -nocomplain drawn($w)
-        if {![llength $windows]} { ::kelmartool::changes -command {} }
+        if {![llength $windows]} {
+            variable chained
+            ::kelmartool::changes -command $chained
+            set chained {}
+        }
+    }
+
+    # The change script of the open windows: the one set before them, then the redraw. An error of
+    # the former is the tool's background error, as it would be with no window.
+    proc changed {} {
+        variable chained
+        catch {uplevel #0 $chained} message options
+        redrawAll
+        return -options $options $message
     }
 
     # Redraws each window whose picture is out of date: drawn at another count of changes, size or

@@ -5,8 +5,9 @@
 // rectangle written as SVG, or as PNG through Tk. With one size given the other follows the
 // rectangle's proportions; with none the picture is 800 pixels wide. The format is the file's
 // extension (.png) unless -format gives it.
-// kelmartool::changes ?-command SCRIPT?: the count of changes of what the picture shows; SCRIPT
-// runs in the idle pass after changes, once for all of them (the window's redraw).
+// kelmartool::changes ?-command ?SCRIPT??: the count of changes of what the picture shows; SCRIPT
+// runs in the idle pass after changes, once for all of them (the window's redraw); -command alone
+// gives the script set.
 #include "scene_commands.h"
 
 #include <algorithm>
@@ -273,8 +274,8 @@ int SnapshotCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const obj
 }
 
 int ChangesCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]) {
-    if (objc != 1 && objc != 3) {
-        Tcl_WrongNumArgs(interp, 1, objv, "?-command script?");
+    if (objc > 3) {
+        Tcl_WrongNumArgs(interp, 1, objv, "?-command ?script??");
         return TCL_ERROR;
     }
     const StatePtr state = StateOf(interp);
@@ -282,13 +283,19 @@ int ChangesCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv
         Tcl_SetObjResult(interp, Tcl_NewStringObj(kStateGone, -1));
         return TCL_ERROR;
     }
-    if (objc == 3) {
+    if (objc >= 2) {
         static const char* const kOptions[] = {"-command", nullptr};
         int index = 0;
         if (Tcl_GetIndexFromObj(interp, objv[1], kOptions, "option", 0, &index) != TCL_OK) {
             SetRefusal(*state, Refusal::Value);
             return TCL_ERROR;
         }
+    }
+    if (objc == 2) {  // the script set, or "" when none
+        Tcl_SetObjResult(interp, state->onChange ? state->onChange.get() : Tcl_NewObj());
+        return TCL_OK;
+    }
+    if (objc == 3) {
         int length = 0;
         Tcl_GetStringFromObj(objv[2], &length);
         state->onChange = length == 0 ? TclValue() : TclValue(objv[2]);
