@@ -73,14 +73,20 @@ bool ParseRect(Tcl_Interp* interp, const ToolState& state, Tcl_Obj* value, Viewp
     return true;
 }
 
+// The index of `value` in the null-ended `words` (an option, a choice); false with Tcl's message
+// and the VALUE code when it is none of them.
+bool Choose(Tcl_Interp* interp, const ToolState& state, Tcl_Obj* value, const char* const* words, const char* what,
+            int& index) {
+    if (Tcl_GetIndexFromObj(interp, value, words, what, 0, &index) == TCL_OK) return true;
+    SetRefusal(state, Refusal::Value);
+    return false;
+}
+
 // The value of -nets: all, marked or none.
 bool ParseNets(Tcl_Interp* interp, const ToolState& state, Tcl_Obj* value, NetLines& nets) {
     static const char* const kWords[] = {"all", "marked", "none", nullptr};
     int index = 0;
-    if (Tcl_GetIndexFromObj(interp, value, kWords, "net choice", 0, &index) != TCL_OK) {
-        SetRefusal(state, Refusal::Value);
-        return false;
-    }
+    if (!Choose(interp, state, value, kWords, "net choice", index)) return false;
     nets = index == 0 ? NetLines::All : index == 1 ? NetLines::Marked : NetLines::None;
     return true;
 }
@@ -107,10 +113,7 @@ int SceneCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv[]
         for (int i = 1; i < objc; i += 2) {
             static const char* const kOptions[] = {"-rect", "-nets", nullptr};
             int index = 0;
-            if (Tcl_GetIndexFromObj(interp, objv[i], kOptions, "option", 0, &index) != TCL_OK) {
-                SetRefusal(*state, Refusal::Value);
-                return TCL_ERROR;
-            }
+            if (!Choose(interp, *state, objv[i], kOptions, "option", index)) return TCL_ERROR;
             if (index == 0 ? !ParseRect(interp, *state, objv[i + 1], rect) : !ParseNets(interp, *state, objv[i + 1], nets))
                 return TCL_ERROR;
         }
@@ -213,20 +216,14 @@ int SnapshotCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const obj
             static const char* const kOptions[] = {"-width", "-height", "-nets", "-format", nullptr};
             static const char* const kFormats[] = {"svg", "png", nullptr};
             int index = 0;
-            if (Tcl_GetIndexFromObj(interp, objv[i], kOptions, "option", 0, &index) != TCL_OK) {
-                SetRefusal(*state, Refusal::Value);
-                return TCL_ERROR;
-            }
+            if (!Choose(interp, *state, objv[i], kOptions, "option", index)) return TCL_ERROR;
             if (index == 2) {
                 if (!ParseNets(interp, *state, objv[i + 1], nets)) return TCL_ERROR;
                 continue;
             }
             if (index == 3) {
                 int format = 0;
-                if (Tcl_GetIndexFromObj(interp, objv[i + 1], kFormats, "format", 0, &format) != TCL_OK) {
-                    SetRefusal(*state, Refusal::Value);
-                    return TCL_ERROR;
-                }
+                if (!Choose(interp, *state, objv[i + 1], kFormats, "format", format)) return TCL_ERROR;
                 png = format == 1;
                 continue;
             }
@@ -286,10 +283,7 @@ int ChangesCommand(ClientData, Tcl_Interp* interp, int objc, Tcl_Obj* const objv
     if (objc >= 2) {
         static const char* const kOptions[] = {"-command", nullptr};
         int index = 0;
-        if (Tcl_GetIndexFromObj(interp, objv[1], kOptions, "option", 0, &index) != TCL_OK) {
-            SetRefusal(*state, Refusal::Value);
-            return TCL_ERROR;
-        }
+        if (!Choose(interp, *state, objv[1], kOptions, "option", index)) return TCL_ERROR;
     }
     if (objc == 2) {  // the script set, or "" when none
         Tcl_SetObjResult(interp, state->onChange ? state->onChange.get() : Tcl_NewObj());
