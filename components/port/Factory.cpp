@@ -17,6 +17,7 @@
 #include <mutex>
 #include <type_traits>
 
+#include "Port/Folder.h"
 #include "Port/Init.h"
 
 namespace CitP {
@@ -106,11 +107,8 @@ void Anchor() {}
 // The folder that holds this library, with its trailing slash; empty when it cannot be told, and
 // then the loader's own search finds the component library.
 Port::StringBase<char> LibraryFolder() {
-    Dl_info info{};
-    if (dladdr(reinterpret_cast<void*>(&Anchor), &info) == 0 || !info.dli_fname) return {};
-    const char* slash = std::strrchr(info.dli_fname, '/');
-    if (!slash) return {};
-    return Port::StringBase<char>(info.dli_fname, static_cast<int32_t>(slash - info.dli_fname + 1));
+    const std::string folder = Port::FolderOf(reinterpret_cast<const void*>(&Anchor));
+    return Port::StringBase<char>(folder.data(), static_cast<int32_t>(folder.size()));
 }
 
 Port::StringBase<char> LibraryPath(const Port::StringBase<char>& name) {

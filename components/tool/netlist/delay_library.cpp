@@ -10,13 +10,11 @@
 // and "setup". Nothing else is taken, so that a misspelt key cannot pass unnoticed.
 #include "delay_library.h"
 
-#include <dlfcn.h>
-
 #include <cmath>
-#include <cstring>
 
 #include <nlohmann/json.hpp>
 
+#include "Port/Folder.h"
 #include "design.h"
 #include "json_shown.h"
 
@@ -147,11 +145,7 @@ std::string ReadDelayLibrary(const std::string& file, const std::string& text, D
 }
 
 std::string DefaultDelayLibraryFile() {
-    Dl_info info{};
-    if (dladdr(reinterpret_cast<void*>(&Anchor), &info) == 0 || !info.dli_fname) return "kelmartool_delays.json";
-    const char* slash = std::strrchr(info.dli_fname, '/');
-    return (slash ? std::string(info.dli_fname, static_cast<std::size_t>(slash - info.dli_fname + 1)) : std::string()) +
-           "kelmartool_delays.json";
+    return Port::FolderOf(reinterpret_cast<const void*>(&Anchor)) + "kelmartool_delays.json";
 }
 
 }  // namespace kelmartool
